@@ -1,0 +1,164 @@
+#pragma once
+
+#include <LumoraKit/platform/LMRError.h>
+#include <LumoraKit/platform/Observable.h>
+#include <LumoraKit/platform/Property.h>
+#include <LumoraKit/platform/Queues.h>
+
+#include <atomic>
+#include <functional>
+#include <memory>
+#include <optional>
+#include <string>
+#include <type_traits>
+
+class KTAction;
+
+/// Held by whoever starts an action; a started action also keeps itself alive until it has ended.
+using KTActionRef = std::shared_ptr<KTAction>;
+
+/// One asynchronous operation that is run once and reports success or failure to a target.
+///
+/// Without blocking the caller:
+///
+///     action->setFinishTarget_selector(recorder, &Recorder::startedWithAction);
+///     action->setErrorTarget_selector(recorder, &Recorder::failedWithAction);
+///     action->start();
+///
+/// On a thread that may block:
+///
+///     action->runSynchronously();
+///     if (action->error()) { ... }
+///
+/// A subclass overrides startExecution() and calls finish() once its work is done, after setError() when it failed.
+/// The end has one order: the error is final, stopExecution() runs, isRunning() turns false and its observers are
+/// told, then one target is told: the error target when there is an error, else the finish target. The end is
+/// delivered on the queue that start() was called on (the main queue, or the serial queue of the calling task), on a
+/// worker when the caller had none, and on the calling thread by runSynchronously(). A second finish() is ignored.
+class LUMORA_EXPORT KTAction : public std::enable_shared_from_this<KTAction> {
+public:
+  KTAction(const KTAction&) = delete;
+  KTAction& operator=(const KTAction&) = delete;
+  virtual ~KTAction();
+
+  /// Begins the action and returns at once. An action runs once: a second start is a programming error (asserted).
+  /// Any thread.
+  void start();
+  /// Runs the action and returns after it has ended and its target has been told. Blocks. Any thread.
+  void runSynchronously();
+
+  /// Whom to tell of the end: a member function of `target` that takes nothing, or the action as
+  /// `const std::shared_ptr<A>&` with A this class or the action's own (any other is asserted). The target is held
+  /// weakly: one that died is not told. A null target clears. To be set before the start, or on the queue that the end
+  /// is delivered on.
+  template <class Target, class Selector>
+  void setFinishTarget_selector(const std::shared_ptr<Target>& target, Selector selector) {
+    setFinishMessage(message(target, selector));
+  }
+  template <class Target, class Selector>
+  void setErrorTarget_selector(const std::shared_ptr<Target>& target, Selector selector) {
+    setErrorMessage(message(target, selector));
+  }
+  /// Clears the finish target.
+  void setFinishTarget(std::nullptr_t);
+  void setErrorTarget(std::nullptr_t);
+
+  /// Null while the action has not failed. Any thread.
+  LMRErrorRef error() const { return error_.get(); }
+  void setError(LMRErrorRef error) { error_.set(std::move(error)); }
+
+  /// The progress text for the user. Any thread.
+  std::string description() const { return description_.get(); }
+  void setDescription(std::string description) { description_.set(std::move(description)); }
+
+  /// What the caller wants carried with the action; absent unless set. Any thread.
+  std::optional<lumora::Dictionary> userInfo() const { return userInfo_.get(); }
+  void setUserInfo(std::optional<lumora::Dictionary> userInfo) { userInfo_.set(std::move(userInfo)); }
+
+  /// True from the start until just before the target is told. Any thread.
+  bool isRunning() const { return running_.load(std::memory_order_acquire); }
+  /// Calls the observer after each change of isRunning(), on the thread that changed it.
+  [[nodiscard]] lumora::Connection observeRunning(std::function<void()> observer);
+  /// Tells the observers of isRunning() although it did not change.
+  void notifyRunningObservers();
+
+protected:
+  using Message = std::function<void(const KTActionRef&)>;
+
+  KTAction();
+
+  /// Does the work, and sees to it that finish() is called in the end. Runs on a worker when executionBlocks(), else
+  /// on the thread that started the action.
+  virtual void startExecution() = 0;
+  /// Called once at the end, with error() final and isRunning() still true.
+  virtual void stopExecution();
+  /// Whether startExecution() blocks its thread. True unless overridden; an action that only starts others says false.
+  virtual bool executionBlocks() const;
+
+  /// To be called once by the subclass, on any thread.
+  void finish();
+
+  /// Starts an action that this one is made of: synchronously when this one is run synchronously, so that it needs
+  /// no queue, else with start().
+  void startPart(const KTActionRef& part);
+
+  /// Called after the part's own target has been told; for actions that are made of others.
+  static void setEndObserver(const KTActionRef& part, std::function<void()> observer);
+
+private:
+  enum class State { Ready, Running, Ending, Ended };
+
+  void begin();
+  void end();
+  void setFinishMessage(Message message);
+  void setErrorMessage(Message message);
+
+  template <class Target, class Selector>
+  static Message message(const std::shared_ptr<Target>& target, Selector selector);
+
+  lumora::Property<LMRErrorRef> error_;
+  lumora::Property<std::string> description_;
+  lumora::Property<std::optional<lumora::Dictionary>> userInfo_;
+  lumora::Property<Message> finishMessage_;
+  lumora::Property<Message> errorMessage_;
+  lumora::Notifier runningNotifier_;
+  std::atomic<bool> running_{false};
+  std::atomic<State> state_{State::Ready};
+  std::function<void()> endObserver_;
+  std::shared_ptr<lumora::WorkQueue> callerQueue_;
+  bool synchronous_ = false;
+};
+
+namespace lumora::detail {
+
+[[noreturn]] LUMORA_EXPORT void wrongActionClass();
+
+template <class Target, class Class, class Action>
+void sendWithAction(Target& target, void (Class::*selector)(const std::shared_ptr<Action>&),
+                    const KTActionRef& action) {
+  auto received = std::dynamic_pointer_cast<Action>(action);
+  if (!received) {
+    wrongActionClass();
+  }
+  (target.*selector)(received);
+}
+
+} // namespace lumora::detail
+
+template <class Target, class Selector>
+KTAction::Message KTAction::message(const std::shared_ptr<Target>& target, Selector selector) {
+  if (!target) {
+    return nullptr;
+  }
+  return [weak = std::weak_ptr<Target>(target), selector](const KTActionRef& action) {
+    const auto receiver = weak.lock();
+    if (!receiver) {
+      return;
+    }
+    if constexpr (std::is_invocable_v<Selector, Target&>) {
+      ((*receiver).*selector)();
+    } else {
+      lumora::detail::sendWithAction(*receiver, selector, action);
+    }
+  };
+}

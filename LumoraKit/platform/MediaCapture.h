@@ -1,0 +1,173 @@
+#pragma once
+
+#include <LumoraKit/platform/LMRError.h>
+
+#include <cstdint>
+#include <filesystem>
+#include <memory>
+#include <optional>
+#include <string>
+#include <vector>
+
+/// \file
+/// Media capture as the recorders use it: devices, inputs with their connections, sessions, and the output that
+/// writes a movie file. Everything is any-thread unless it says otherwise; objects are shared, and a session keeps
+/// its inputs and outputs.
+
+namespace lumora {
+
+/// What a device or a connection delivers. A muxed device delivers sound and video in one stream; a connection is
+/// never muxed.
+enum class MediaType { Video, Sound, Muxed };
+
+/// Ticks of the host clock: nanoseconds of CLOCK_MONOTONIC.
+using HostTime = std::uint64_t;
+
+/// A camera, microphone or muxed device. Its identifier is the same after a restart of the device, the sound server
+/// or the machine.
+class LUMORA_EXPORT CaptureDevice {
+public:
+  virtual ~CaptureDevice();
+  virtual std::string uniqueID() const = 0;
+  /// For the user, in the user's language where the system knows it.
+  virtual std::string localizedDisplayName() const = 0;
+  virtual bool hasMediaType(MediaType type) const = 0;
+  /// Makes the device ready for an input. Blocks for 5 seconds at most; null on success.
+  virtual LMRErrorRef open() = 0;
+};
+
+/// One stream of an input into a session.
+class LUMORA_EXPORT CaptureConnection {
+public:
+  virtual ~CaptureConnection();
+  virtual MediaType mediaType() const = 0;
+  /// A disabled connection delivers no samples and has no track in a recording.
+  virtual bool isEnabled() const = 0;
+  virtual void setEnabled(bool enabled) = 0;
+};
+
+/// A source of a session.
+class LUMORA_EXPORT CaptureInput {
+public:
+  virtual ~CaptureInput();
+  virtual std::vector<std::shared_ptr<CaptureConnection>> connections() const = 0;
+  /// The device behind a device input; null for the screen.
+  virtual std::shared_ptr<CaptureDevice> device() const = 0;
+};
+
+/// How a connection's track is encoded; what is absent is chosen by the framework.
+struct CompressionOptions {
+  /// "h264", "mjpeg", "aac" or "pcm".
+  std::optional<std::string> codec;
+  /// Bits per second.
+  std::optional<std::uint32_t> bitRate;
+  /// Video only, in pixels: both or none.
+  std::optional<std::uint32_t> width;
+  std::optional<std::uint32_t> height;
+
+  friend bool operator==(const CompressionOptions&, const CompressionOptions&) = default;
+};
+
+/// A captured sample buffer, valid during the callback that shows it.
+class LUMORA_EXPORT SampleBuffer {
+public:
+  virtual ~SampleBuffer();
+  /// When it was captured, on the host clock; nothing when the device did not say.
+  virtual std::optional<HostTime> hostTime() const = 0;
+};
+
+class MovieFileOutput;
+
+/// Who is told by a movie-file output. Sample buffers arrive on the devices' threads, one thread a connection; the
+/// other messages one at a time, in order, on a thread of the output. A delegate may call the output from inside any
+/// message.
+class LUMORA_EXPORT MovieFileOutputDelegate {
+public:
+  using Connections = std::vector<std::shared_ptr<CaptureConnection>>;
+
+  virtual ~MovieFileOutputDelegate();
+  virtual void
+  captureOutput_didStartRecordingToOutputFileAtURL_forConnections(const std::shared_ptr<MovieFileOutput>& output,
+                                                                  const std::filesystem::path& file,
+                                                                  const Connections& connections) = 0;
+  virtual void
+  captureOutput_didPauseRecordingToOutputFileAtURL_forConnections(const std::shared_ptr<MovieFileOutput>& output,
+                                                                  const std::filesystem::path& file,
+                                                                  const Connections& connections) = 0;
+  virtual void
+  captureOutput_didResumeRecordingToOutputFileAtURL_forConnections(const std::shared_ptr<MovieFileOutput>& output,
+                                                                   const std::filesystem::path& file,
+                                                                   const Connections& connections) = 0;
+  virtual void captureOutput_willFinishRecordingToOutputFileAtURL_forConnections_dueToError(
+      const std::shared_ptr<MovieFileOutput>& output, const std::filesystem::path& file, const Connections& connections,
+      const LMRErrorRef& error) = 0;
+  virtual void captureOutput_didFinishRecordingToOutputFileAtURL_forConnections_dueToError(
+      const std::shared_ptr<MovieFileOutput>& output, const std::filesystem::path& file, const Connections& connections,
+      const LMRErrorRef& error) = 0;
+  /// For every sample of every connection, before the output itself uses it: a recording started, paused or resumed
+  /// inside this call starts, pauses or resumes at exactly this sample.
+  virtual void captureOutput_didOutputSampleBuffer_fromConnection(MovieFileOutput& output,
+                                                                  const SampleBuffer& sampleBuffer,
+                                                                  CaptureConnection& connection) = 0;
+};
+
+/// Writes one movie file at a time from a session's connections. Requests return at once; their outcome is a message
+/// to the delegate. Any thread.
+class LUMORA_EXPORT MovieFileOutput {
+public:
+  virtual ~MovieFileOutput();
+  /// Not owned: a delegate that died is not told.
+  virtual void setDelegate(const std::weak_ptr<MovieFileOutputDelegate>& delegate) = 0;
+  /// The connections of the session that the output was added to.
+  virtual std::vector<std::shared_ptr<CaptureConnection>> connections() const = 0;
+  /// Takes effect with the next file.
+  virtual void setCompressionOptions_forConnection(const CompressionOptions& options,
+                                                   const std::shared_ptr<CaptureConnection>& connection) = 0;
+  /// Begins to write that file, or, without one, finishes the current file.
+  virtual void recordToOutputFileURL(const std::optional<std::filesystem::path>& file) = 0;
+  virtual void pauseRecording() = 0;
+  virtual void resumeRecording() = 0;
+  /// The file being written; nothing when none is.
+  virtual std::optional<std::filesystem::path> outputFileURL() const = 0;
+};
+
+/// Inputs and outputs that run together.
+class LUMORA_EXPORT CaptureSession {
+public:
+  virtual ~CaptureSession();
+  /// Null on success.
+  virtual LMRErrorRef addInput(const std::shared_ptr<CaptureInput>& input) = 0;
+  virtual LMRErrorRef addOutput(const std::shared_ptr<MovieFileOutput>& output) = 0;
+  virtual void removeOutput(const std::shared_ptr<MovieFileOutput>& output) = 0;
+  virtual std::vector<std::shared_ptr<CaptureInput>> inputs() const = 0;
+  virtual std::vector<std::shared_ptr<MovieFileOutput>> outputs() const = 0;
+
+  /// Starts every device and waits for the first sample of each enabled connection. Blocks for 5 seconds at most.
+  /// Null on success; a device that gives no sample in 2 seconds is an error.
+  virtual LMRErrorRef startRunning() = 0;
+  /// Stops the devices; a file being written is finished. Safe to call when not running.
+  virtual void stopRunning() = 0;
+  virtual bool isRunning() const = 0;
+};
+
+/// The machine's capture system.
+class LUMORA_EXPORT MediaCapture {
+public:
+  virtual ~MediaCapture();
+
+  /// Null when there is none.
+  virtual std::shared_ptr<CaptureDevice> defaultInputDevice(MediaType type) = 0;
+  virtual std::vector<std::shared_ptr<CaptureDevice>> inputDevices(MediaType type) = 0;
+  virtual std::shared_ptr<CaptureDevice> deviceWithUniqueID(const std::string& uniqueID) = 0;
+
+  virtual std::shared_ptr<CaptureInput> makeDeviceInput(const std::shared_ptr<CaptureDevice>& device) = 0;
+  /// An input that captures the main screen.
+  virtual std::shared_ptr<CaptureInput> makeScreenInput() = 0;
+  virtual std::shared_ptr<CaptureSession> makeSession() = 0;
+  virtual std::shared_ptr<MovieFileOutput> makeMovieFileOutput() = 0;
+
+  /// The host clock now.
+  virtual HostTime hostTime() const = 0;
+};
+
+} // namespace lumora

@@ -1,0 +1,138 @@
+#pragma once
+
+#include <LumoraKit/platform/Export.h>
+
+#include <chrono>
+#include <cstddef>
+#include <cstdint>
+#include <initializer_list>
+#include <memory>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <utility>
+#include <variant>
+#include <vector>
+
+/// \file
+/// Property-list values: what the tools' requests and replies, the metadata files and the preferences carry.
+
+namespace lumora {
+
+class Value;
+class Dictionary;
+
+/// An ordered list of values.
+using Array = std::vector<Value>;
+
+/// Raw bytes.
+using Data = std::vector<std::uint8_t>;
+
+/// A moment in UTC with the resolution of a property list: whole seconds.
+using Date = std::chrono::sys_seconds;
+
+/// One property-list value. A value type: copies are deep, moves are cheap, and nesting of any depth is destroyed
+/// without recursion. Signed and unsigned integers are kept apart only where it matters: an integer that fits
+/// std::int64_t is always held as such, so that equal numbers compare equal whatever they were made from.
+class LUMORA_EXPORT Value {
+public:
+  enum class Type { String, Integer, UnsignedInteger, Real, Boolean, Date, Data, Array, Dictionary };
+
+  // Implicit, so that a literal can stand wherever a value is asked for.
+  Value(std::string text);
+  Value(std::string_view text);
+  Value(const char* text);
+  Value(bool flag);
+  Value(int number);
+  Value(unsigned number);
+  Value(std::int64_t number);
+  Value(std::uint64_t number);
+  Value(double number);
+  Value(Date date);
+  Value(Data bytes);
+  Value(Array elements);
+  Value(Dictionary entries);
+
+  Value(const Value& other);
+  Value(Value&& other) noexcept;
+  Value& operator=(const Value& other);
+  Value& operator=(Value&& other) noexcept;
+  ~Value();
+
+  Type type() const;
+
+  /// The content when the value is of that type, else null. The pointer lives as long as the value is unchanged.
+  const std::string* string() const;
+  const Data* data() const;
+  const Array* array() const;
+  const Dictionary* dictionary() const;
+  Array* array();
+  Dictionary* dictionary();
+
+  /// The content when the value is of that type, else nothing.
+  std::optional<bool> boolean() const;
+  std::optional<Date> date() const;
+  /// A number that fits, from an integer of either sign or a boolean (0 or 1); nothing for everything else.
+  std::optional<std::int64_t> integer() const;
+  std::optional<std::uint64_t> unsignedInteger() const;
+  /// Any number as a real; nothing for everything else.
+  std::optional<double> real() const;
+
+  /// The text that "%@" prints: a string as it is, an integer in decimal, a real in its shortest round-trip form, a
+  /// boolean as 1 or 0, a date as "2010-01-20 15:04:05 +0000", data as <0fbe...>, and collections in braces.
+  std::string description() const;
+
+  /// Equality of type and content. An integer equals an integer only; a real equals a real only.
+  friend LUMORA_EXPORT bool operator==(const Value& left, const Value& right);
+
+private:
+  // Boxed collections keep a value small; a box is never null except in a moved-from value.
+  using Storage = std::variant<std::string, std::int64_t, std::uint64_t, double, bool, Date, std::unique_ptr<Data>,
+                               std::unique_ptr<Array>, std::unique_ptr<Dictionary>>;
+  Storage storage_;
+};
+
+/// A property-list dictionary: string keys, each once, in the order of their first insertion.
+class LUMORA_EXPORT Dictionary {
+public:
+  using Entry = std::pair<std::string, Value>;
+
+  Dictionary();
+  Dictionary(std::initializer_list<Entry> entries);
+  Dictionary(const Dictionary& other);
+  Dictionary(Dictionary&& other) noexcept;
+  Dictionary& operator=(const Dictionary& other);
+  Dictionary& operator=(Dictionary&& other) noexcept;
+  ~Dictionary();
+
+  /// A dictionary of entries in which a repeated key keeps the place of its first and the value of its last entry.
+  static Dictionary fromEntries(std::vector<Entry> entries);
+
+  bool empty() const;
+  std::size_t size() const;
+  std::vector<Entry>::const_iterator begin() const;
+  std::vector<Entry>::const_iterator end() const;
+
+  /// The value of a key, or null.
+  const Value* find(std::string_view key) const;
+  Value* find(std::string_view key);
+  bool contains(std::string_view key) const;
+
+  /// The string under a key; nothing when the key is absent or its value is not a string.
+  std::optional<std::string> string(std::string_view key) const;
+  /// The dictionary or array under a key, or null when absent or of another type.
+  const Dictionary* dictionary(std::string_view key) const;
+  const Array* array(std::string_view key) const;
+
+  /// Replaces the value of a key in its place, or appends the pair.
+  void set(std::string_view key, Value value);
+  /// Removes a key; true when it was there.
+  bool remove(std::string_view key);
+
+  friend LUMORA_EXPORT bool operator==(const Dictionary& left, const Dictionary& right);
+
+private:
+  std::vector<Entry> entries_;
+};
+
+} // namespace lumora

@@ -1,0 +1,42 @@
+#pragma once
+
+#include <memory>
+
+/// \file
+/// The Linux back ends, each behind its interface; assembled by Platform.cpp.
+
+namespace lumora {
+
+class Application;
+class Files;
+class Log;
+class MainThread;
+class MediaCapture;
+class Preferences;
+class Queues;
+class ToolRunner;
+class WallClock;
+
+namespace backend {
+
+/// Identity from the running program, language from the locale.
+std::shared_ptr<Application> makeApplication();
+/// POSIX files and XDG folders.
+std::shared_ptr<Files> makeFiles();
+/// syslog(3).
+std::shared_ptr<Log> makeSystemLog();
+/// GLib's default main context.
+std::shared_ptr<MainThread> makeMainThread();
+/// GStreamer; initialised when first asked for a device.
+std::shared_ptr<MediaCapture> makeMediaCapture();
+/// One property-list file a domain below the XDG configuration folder.
+std::shared_ptr<Preferences> makePreferences();
+/// An elastic pool of threads.
+std::shared_ptr<Queues> makeQueues(std::shared_ptr<MainThread> mainThread);
+/// posix_spawn(3), poll(2) and a process descriptor.
+std::shared_ptr<ToolRunner> makeToolRunner();
+/// CLOCK_REALTIME.
+std::shared_ptr<WallClock> makeWallClock();
+
+} // namespace backend
+} // namespace lumora

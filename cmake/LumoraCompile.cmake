@@ -1,0 +1,44 @@
+# How everything of the project is compiled.
+
+set(CMAKE_CXX_STANDARD 20)
+set(CMAKE_CXX_STANDARD_REQUIRED ON)
+set(CMAKE_CXX_EXTENSIONS OFF)
+set(CMAKE_CXX_VISIBILITY_PRESET hidden)
+set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
+set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+set(CMAKE_EXPORT_COMPILE_COMMANDS ON)
+# Build folders are reached through ccache's base folder; relative paths let one build's objects serve another.
+find_program(CCACHE_PROGRAM ccache)
+if(CCACHE_PROGRAM)
+  set(CMAKE_CXX_COMPILER_LAUNCHER ${CCACHE_PROGRAM})
+endif()
+
+add_library(lumora-compile INTERFACE)
+target_compile_options(
+  lumora-compile
+  INTERFACE -Wall
+            -Wextra
+            -Wpedantic
+            -Wshadow=local
+            -Wconversion
+            -Wsign-conversion
+            -Wold-style-cast
+            -Wnon-virtual-dtor
+            -Woverloaded-virtual
+            -Wcast-qual
+            -Wformat=2
+            -Wundef
+            -Wimplicit-fallthrough
+            $<$<BOOL:${LUMORAKIT_WARNINGS_AS_ERRORS}>:-Werror>)
+target_include_directories(lumora-compile INTERFACE $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}>)
+if(LUMORAKIT_EXPORT_INTERNALS)
+  target_compile_definitions(lumora-compile INTERFACE LUMORAKIT_EXPORT_INTERNALS)
+endif()
+
+if(LUMORAKIT_SANITIZE)
+  add_compile_options(-fsanitize=${LUMORAKIT_SANITIZE} -fno-omit-frame-pointer)
+  add_link_options(-fsanitize=${LUMORAKIT_SANITIZE})
+  if(LUMORAKIT_SANITIZE MATCHES undefined)
+    add_compile_options(-fno-sanitize-recover=all)
+  endif()
+endif()

@@ -1,0 +1,15 @@
+# Everything that is installed and called. pkg-config names are imported as targets: PkgConfig::NAME.
+
+find_package(PkgConfig REQUIRED)
+find_package(Threads REQUIRED)
+
+function(lumora_pkg name)
+  pkg_check_modules(${name} REQUIRED IMPORTED_TARGET GLOBAL ${ARGN})
+endfunction()
+
+lumora_pkg(GLIB glib-2.0>=2.74 gio-2.0 gobject-2.0)
+lumora_pkg(GSTREAMER gstreamer-1.0>=1.22 gstreamer-app-1.0 gstreamer-audio-1.0 gstreamer-video-1.0)
+lumora_pkg(EXPAT expat)
+lumora_pkg(PUGIXML pugixml)
+lumora_pkg(SQLITE sqlite3)
+lumora_pkg(SODIUM libsodium)
