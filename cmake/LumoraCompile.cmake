@@ -19,7 +19,7 @@ target_compile_options(
   INTERFACE -Wall
             -Wextra
             -Wpedantic
-            -Wshadow=local
+            $<IF:$<CXX_COMPILER_ID:GNU>,-Wshadow=local,-Wshadow>
             -Wconversion
             -Wsign-conversion
             -Wold-style-cast

@@ -1,0 +1,51 @@
+# The Debian packages that each use of the project needs, and how they are installed. Sourced by ./dev.
+
+build_packages=(
+  g++ cmake ninja-build ccache pkg-config
+  libglib2.0-dev libexpat1-dev libpugixml-dev libsqlite3-dev libsodium-dev
+  libgstreamer1.0-dev libgstreamer-plugins-base1.0-dev
+  libgtest-dev libgmock-dev
+)
+
+# GStreamer's elements: capture (PipeWire, PulseAudio, X11), encoders and muxers.
+run_packages=(
+  gstreamer1.0-plugins-base gstreamer1.0-plugins-good gstreamer1.0-plugins-bad gstreamer1.0-plugins-ugly
+  gstreamer1.0-libav gstreamer1.0-pipewire gstreamer1.0-pulseaudio gstreamer1.0-x
+)
+
+# A camera, a microphone and a screen for machines that have none.
+headless_packages=(dbus pipewire pipewire-bin pipewire-pulse wireplumber libspa-0.2-modules xvfb)
+
+demo_packages=("${headless_packages[@]}" gstreamer1.0-tools)
+test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
+bench_packages=(libbenchmark-dev gstreamer1.0-tools bsdextrautils)
+lint_packages=(clang-14 clang-tidy-14 clang-format-14 libclang-rt-14-dev git python3)
+
+# install_packages NAME...: installs those that are missing, and says nothing when none is.
+install_packages() {
+  local missing=() package as_root=()
+  for package in "$@"; do
+    [ "$(dpkg-query --show --showformat='${db:Status-Status}' "$package" 2>/dev/null)" = installed ] ||
+      missing+=("$package")
+  done
+  [ ${#missing[@]} -gt 0 ] || return 0
+  if [ "$(id -u)" -ne 0 ]; then
+    command -v sudo >/dev/null || {
+      echo "dev: these packages are missing, and there is no sudo to install them with: ${missing[*]}" >&2
+      return 1
+    }
+    as_root=(sudo)
+  fi
+  echo "Installing: ${missing[*]}" >&2
+  local log
+  log=$(mktemp)
+  if ! { "${as_root[@]}" apt-get update &&
+    "${as_root[@]}" env DEBIAN_FRONTEND=noninteractive apt-get install -y --no-install-recommends "${missing[@]}"; } \
+    >"$log" 2>&1; then
+    tail -n 20 "$log" >&2
+    rm -f "$log"
+    echo "dev: the packages could not be installed: ${missing[*]}" >&2
+    return 1
+  fi
+  rm -f "$log"
+}
