@@ -145,7 +145,9 @@ public:
   /// Starts every device and waits for the first sample of each enabled connection. Blocks for 5 seconds at most.
   /// Null on success; a device that gives no sample in 2 seconds is an error.
   virtual LMRErrorRef startRunning() = 0;
-  /// Stops the devices; a file being written is finished. Safe to call when not running.
+  /// Stops the devices; a file being written is finished. Safe to call when not running. Returns once the devices
+  /// have stopped; when called from inside a message to an output's delegate (a recorder may die there) it returns at
+  /// once, and they stop afterwards.
   virtual void stopRunning() = 0;
   virtual bool isRunning() const = 0;
 };
