@@ -63,9 +63,9 @@ public:
   void setFinishTarget(std::nullptr_t);
   void setErrorTarget(std::nullptr_t);
 
-  /// Null while the action has not failed. Any thread.
+  /// Null while the action has not failed. Any thread. What is set after finish() was called is ignored.
   LMRErrorRef error() const { return error_.get(); }
-  void setError(LMRErrorRef error) { error_.set(std::move(error)); }
+  void setError(LMRErrorRef error);
 
   /// The progress text for the user. Any thread.
   std::string description() const { return description_.get(); }
@@ -98,6 +98,11 @@ protected:
   /// To be called once by the subclass, on any thread.
   void finish();
 
+  /// Whether start() or runSynchronously() has been called.
+  bool hasStarted() const;
+  /// Whether the action is run by runSynchronously(). Of a started action.
+  bool runsSynchronously() const { return !endQueue_; }
+
   /// Starts an action that this one is made of: synchronously when this one is run synchronously, so that it needs
   /// no queue, else with start().
   void startPart(const KTActionRef& part);
@@ -106,9 +111,9 @@ protected:
   static void setEndObserver(const KTActionRef& part, std::function<void()> observer);
 
 private:
-  enum class State { Ready, Running, Ending, Ended };
+  enum class State { Ready, Running, Finished };
 
-  void begin();
+  void begin(const char* operation);
   void end();
   void setFinishMessage(Message message);
   void setErrorMessage(Message message);
@@ -125,8 +130,9 @@ private:
   std::atomic<bool> running_{false};
   std::atomic<State> state_{State::Ready};
   std::function<void()> endObserver_;
-  std::shared_ptr<lumora::WorkQueue> callerQueue_;
-  bool synchronous_ = false;
+  // Where the end is delivered; null while Ready and when run synchronously.
+  std::shared_ptr<lumora::WorkQueue> endQueue_;
+  KTActionRef self_;
 };
 
 namespace lumora::detail {

@@ -20,7 +20,7 @@ private:
   KTActionQueue();
   void startExecution() override;
   bool executionBlocks() const override { return false; }
-  void startNext();
+  void runNext();
 
   std::deque<KTActionRef> actions_;
 };

@@ -26,7 +26,9 @@ public:
   void runAndWait(const Task& task);
 
   /// Serves the main thread until the condition holds or the time is over: for programs that have no main loop of
-  /// their own (a terminal program, a test). Main thread only. True when the condition holds.
+  /// their own (a terminal program, a test). The condition is asked first, after every piece of work, and every few
+  /// milliseconds, so that it may also look at what other threads do. Main thread only (asserted). True when the
+  /// condition holds.
   virtual bool serveUntil(const std::function<bool()>& condition,
                           std::chrono::milliseconds limit = std::chrono::milliseconds::max()) = 0;
 };

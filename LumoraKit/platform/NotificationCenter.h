@@ -27,11 +27,10 @@ public:
   void post(std::string_view name, const std::any& object);
 
 private:
-  struct Topic;
-  std::shared_ptr<Topic> topic(std::string_view name);
+  std::shared_ptr<detail::Observers> observersOf(std::string_view name);
 
   std::mutex mutex_;
-  std::map<std::string, std::shared_ptr<Topic>, std::less<>> topics_;
+  std::map<std::string, std::shared_ptr<detail::Observers>, std::less<>> observers_;
 };
 
 } // namespace lumora

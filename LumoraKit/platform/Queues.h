@@ -25,14 +25,17 @@ public:
 
   /// A new serial queue.
   virtual std::shared_ptr<WorkQueue> makeSerialQueue(std::string label) = 0;
-  /// The one shared concurrent queue of high priority.
+  /// The one shared concurrent queue of ordinary priority: for work that blocks.
+  virtual std::shared_ptr<WorkQueue> concurrentQueue() = 0;
+  /// The one shared concurrent queue of high priority: its tasks are the first to get a thread when threads are scarce.
   virtual std::shared_ptr<WorkQueue> highPriorityQueue() = 0;
   /// The queue of the main thread.
   virtual std::shared_ptr<WorkQueue> mainQueue() = 0;
   /// The queue that the caller runs on: the main queue on the main thread, the serial queue whose task is running,
   /// else null.
   virtual std::shared_ptr<WorkQueue> currentQueue() = 0;
-  /// Queues the task after the delay, which may be zero.
+  /// Queues the task after the delay; at once when it is zero or less. Tasks that are due at the same moment keep the
+  /// order of the calls.
   virtual void runAfter(std::chrono::nanoseconds delay, std::shared_ptr<WorkQueue> queue, Task task) = 0;
 };
 

@@ -10,16 +10,10 @@ __attribute__((weak)) std::shared_ptr<Files> makeFiles() {
 __attribute__((weak)) std::shared_ptr<Log> makeSystemLog() {
   return nullptr;
 }
-__attribute__((weak)) std::shared_ptr<MainThread> makeMainThread() {
-  return nullptr;
-}
 __attribute__((weak)) std::shared_ptr<MediaCapture> makeMediaCapture() {
   return nullptr;
 }
 __attribute__((weak)) std::shared_ptr<Preferences> makePreferences() {
-  return nullptr;
-}
-__attribute__((weak)) std::shared_ptr<Queues> makeQueues(std::shared_ptr<MainThread>) {
   return nullptr;
 }
 __attribute__((weak)) std::shared_ptr<ToolRunner> makeToolRunner() {

@@ -1,0 +1,87 @@
+#pragma once
+
+#include <LumoraKit/platform/KTAction.h>
+
+#include <functional>
+#include <memory>
+#include <string>
+#include <thread>
+#include <utility>
+#include <vector>
+
+namespace lumora::tests {
+
+/// An action whose work is a function, which is to call end() or fail().
+class SampleAction : public KTAction {
+public:
+  using Work = std::function<void(SampleAction&)>;
+
+  /// Its work runs on a worker.
+  static std::shared_ptr<SampleAction> blocking(Work work) {
+    return std::make_shared<SampleAction>(std::move(work), true);
+  }
+  /// Its work runs on the thread that starts it.
+  static std::shared_ptr<SampleAction> composite(Work work) {
+    return std::make_shared<SampleAction>(std::move(work), false);
+  }
+  static std::shared_ptr<SampleAction> succeeding() {
+    return blocking([](SampleAction& action) { action.end(); });
+  }
+  static std::shared_ptr<SampleAction> failing() {
+    return blocking([](SampleAction& action) { action.fail(); });
+  }
+
+  SampleAction(Work work, bool blocks) : work_(std::move(work)), blocks_(blocks) {}
+
+  void end() { finish(); }
+  void fail() {
+    setError(sampleError());
+    finish();
+  }
+  void runPart(const KTActionRef& part) { startPart(part); }
+  static LMRErrorRef sampleError() { return LMRError::make(LMRErrorDomain, 26, "Not authorized"); }
+
+  std::function<void(SampleAction&)> whenStopping;
+
+private:
+  void startExecution() override { work_(*this); }
+  void stopExecution() override {
+    if (whenStopping) {
+      whenStopping(*this);
+    }
+  }
+  bool executionBlocks() const override { return blocks_; }
+
+  const Work work_;
+  const bool blocks_;
+};
+
+/// A target that notes what it is told, in order, and where.
+class Listener {
+public:
+  void finished() { note("finished"); }
+  void failed() { note("failed"); }
+  void finishedWithAction(const std::shared_ptr<SampleAction>& action) {
+    received = action;
+    note("finished");
+  }
+  void failedWithBase(const KTActionRef& action) {
+    received = action;
+    note("failed");
+  }
+
+  void note(std::string what) {
+    told.push_back(std::move(what));
+    thread = std::this_thread::get_id();
+  }
+  void listenTo(const KTActionRef& action, const std::shared_ptr<Listener>& self) const {
+    action->setFinishTarget_selector(self, &Listener::finished);
+    action->setErrorTarget_selector(self, &Listener::failed);
+  }
+
+  std::vector<std::string> told;
+  std::thread::id thread;
+  KTActionRef received;
+};
+
+} // namespace lumora::tests
