@@ -2,6 +2,7 @@
 
 #include <LumoraKit/platform/LMRError.h>
 
+#include <cstddef>
 #include <functional>
 #include <map>
 #include <memory>
@@ -18,6 +19,12 @@ namespace lumora {
 class KeyedArchiver;
 class KeyedUnarchiver;
 
+/// Domain of errors of the unarchiver's own; a text that is no property list keeps the error of its reader.
+inline constexpr std::string_view KeyedArchiveErrorDomain = "org.vantor.lumora.archive";
+
+/// Why a property list was refused (the code of the error).
+enum class KeyedArchiveError { NotAnArchive = 1, UnknownClass };
+
 /// What can be archived.
 class LUMORA_EXPORT Archivable {
 public:
@@ -30,8 +37,9 @@ public:
 /// Collects one object's keys.
 class LUMORA_EXPORT KeyedArchiver {
 public:
-  /// The archive of an object: a property list in XML.
-  static std::string archivedData(const Archivable& object);
+  /// The archive of an object: a property list in XML. Empty, with the error set, when an encoded text holds what XML
+  /// cannot carry.
+  static std::string archivedData(const Archivable& object, LMRErrorRef* error = nullptr);
 
   /// A key encoded twice keeps the last value.
   void encode(std::string_view key, Value value);
@@ -50,19 +58,26 @@ public:
   using ClassTable = std::map<std::string, Factory, std::less<>>;
 
   /// The object in an archive. Null, with the error set, when the text is no archive or names an unknown class; null
-  /// without an error when the class refused.
+  /// with a null error when the class refused.
   static std::shared_ptr<Archivable> unarchivedObject(std::string_view archive, const ClassTable& classes,
                                                       LMRErrorRef* error = nullptr);
 
   /// Nothing when the key is absent or of another type.
   std::optional<std::string> decodeString(std::string_view key) const;
-  /// The objects under a key; those that their class refused are left out.
+  /// The objects under a key; those that their class refused, or whose class is unknown, are left out.
   std::vector<std::shared_ptr<Archivable>> decodeObjects(std::string_view key) const;
 
 private:
-  KeyedUnarchiver(const Dictionary& keys, const ClassTable& classes);
+  // Decoding recurses through the classes' own code, so a made-up archive must not nest without end.
+  static constexpr std::size_t depthLimit = 100;
+
+  KeyedUnarchiver(const Dictionary& keys, const ClassTable& classes, std::size_t depth);
+  static std::shared_ptr<Archivable> decoded(const Dictionary& object, const ClassTable& classes, std::size_t depth,
+                                             LMRErrorRef* error);
+
   const Dictionary& keys_;
   const ClassTable& classes_;
+  std::size_t depth_;
 };
 
 } // namespace lumora

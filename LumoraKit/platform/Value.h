@@ -31,9 +31,10 @@ using Data = std::vector<std::uint8_t>;
 /// A moment in UTC with the resolution of a property list: whole seconds.
 using Date = std::chrono::sys_seconds;
 
-/// One property-list value. A value type: copies are deep, moves are cheap, and nesting of any depth is destroyed
-/// without recursion. Signed and unsigned integers are kept apart only where it matters: an integer that fits
-/// std::int64_t is always held as such, so that equal numbers compare equal whatever they were made from.
+/// One property-list value. A value type: copies are deep, moves are cheap, and nesting of any depth is copied,
+/// compared, described and destroyed without recursion. Signed and unsigned integers are kept apart only where it
+/// matters: an integer that fits std::int64_t is always held as such, so that equal numbers compare equal whatever they
+/// were made from. A moved-from value may only be assigned to or destroyed.
 class LUMORA_EXPORT Value {
 public:
   enum class Type { String, Integer, UnsignedInteger, Real, Boolean, Date, Data, Array, Dictionary };
@@ -75,17 +76,21 @@ public:
   /// A number that fits, from an integer of either sign or a boolean (0 or 1); nothing for everything else.
   std::optional<std::int64_t> integer() const;
   std::optional<std::uint64_t> unsignedInteger() const;
-  /// Any number as a real; nothing for everything else.
+  /// Any number, an integer and a boolean included, as a real; nothing for everything else.
   std::optional<double> real() const;
 
   /// The text that "%@" prints: a string as it is, an integer in decimal, a real in its shortest round-trip form, a
-  /// boolean as 1 or 0, a date as "2010-01-20 15:04:05 +0000", data as <0fbe...>, and collections in braces.
+  /// boolean as 1 or 0, a date as "2010-01-20 15:04:05 +0000", data as <0fbe>, an array as [first, second] and a
+  /// dictionary as {key: value, key: value}.
   std::string description() const;
 
-  /// Equality of type and content. An integer equals an integer only; a real equals a real only.
+  /// Equality of type and content. An integer equals an integer only; a real equals a real only, and not-a-number
+  /// equals itself.
   friend LUMORA_EXPORT bool operator==(const Value& left, const Value& right);
 
 private:
+  friend LUMORA_EXPORT bool operator==(const Dictionary& left, const Dictionary& right);
+  struct Internals;
   // Boxed collections keep a value small; a box is never null except in a moved-from value.
   using Storage = std::variant<std::string, std::int64_t, std::uint64_t, double, bool, Date, std::unique_ptr<Data>,
                                std::unique_ptr<Array>, std::unique_ptr<Dictionary>>;
@@ -129,9 +134,11 @@ public:
   /// Removes a key; true when it was there.
   bool remove(std::string_view key);
 
+  /// The same keys with equal values, in whatever order.
   friend LUMORA_EXPORT bool operator==(const Dictionary& left, const Dictionary& right);
 
 private:
+  friend class Value;
   std::vector<Entry> entries_;
 };
 
