@@ -1,0 +1,7 @@
+#include <LumoraKit/platform/Files.h>
+
+namespace lumora {
+
+Files::~Files() = default;
+
+} // namespace lumora

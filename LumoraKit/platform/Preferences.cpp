@@ -1,0 +1,7 @@
+#include <LumoraKit/platform/Preferences.h>
+
+namespace lumora {
+
+Preferences::~Preferences() = default;
+
+} // namespace lumora

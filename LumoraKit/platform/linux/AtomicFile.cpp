@@ -1,0 +1,110 @@
+#include <LumoraKit/platform/linux/AtomicFile.h>
+#include <LumoraKit/platform/linux/FileDescriptor.h>
+
+#include <cerrno>
+#include <cstdio>
+#include <cstdlib>
+#include <string>
+#include <system_error>
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+namespace lumora::backend {
+namespace {
+
+// A new file beside its final place, removed again unless it was moved there. Its functions give 0 or errno.
+class TemporaryFile {
+public:
+  explicit TemporaryFile(const std::filesystem::path& folder) : name_((folder / ".lumora-XXXXXX").string()) {}
+  TemporaryFile(const TemporaryFile&) = delete;
+  TemporaryFile& operator=(const TemporaryFile&) = delete;
+  ~TemporaryFile() {
+    if (exists_) {
+      unlink(name_.c_str());
+    }
+  }
+
+  int create() {
+    file_ = FileDescriptor(mkostemp(name_.data(), O_CLOEXEC));
+    exists_ = file_.isOpen();
+    return exists_ ? 0 : errno;
+  }
+
+  int write(std::string_view content) {
+    while (!content.empty()) {
+      const ssize_t written = ::write(file_.get(), content.data(), content.size());
+      if (written >= 0) {
+        content.remove_prefix(static_cast<std::size_t>(written));
+      } else if (errno != EINTR) {
+        return errno;
+      }
+    }
+    return fsync(file_.get()) == 0 ? 0 : errno;
+  }
+
+  int moveTo(const std::filesystem::path& path) {
+    if (std::rename(name_.c_str(), path.c_str()) != 0) {
+      return errno;
+    }
+    exists_ = false;
+    return 0;
+  }
+
+private:
+  std::string name_;
+  FileDescriptor file_;
+  bool exists_ = false;
+};
+
+// The new file is in place already: when the folder cannot be flushed (some file systems refuse that), only a crash
+// within the next seconds could still bring the old one back.
+void flushDirectory(const std::filesystem::path& folder) {
+  const FileDescriptor directory(open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+  if (directory.isOpen()) {
+    fsync(directory.get());
+  }
+}
+
+} // namespace
+
+LMRErrorRef replaceFile(const std::filesystem::path& path, std::string_view content) {
+  const auto folder = path.has_parent_path() ? path.parent_path() : std::filesystem::path(".");
+  TemporaryFile file(folder);
+  int error = file.create();
+  if (error == 0) {
+    error = file.write(content);
+  }
+  if (error == 0) {
+    error = file.moveTo(path);
+  }
+  if (error != 0) {
+    return LMRError::fromErrno(error, path.string());
+  }
+  flushDirectory(folder);
+  return nullptr;
+}
+
+LMRErrorRef makeDirectories(const std::filesystem::path& path, mode_t permissions) {
+  std::filesystem::path current;
+  for (const auto& part : path) {
+    current /= part;
+    if (isExistingDirectory(current) || mkdir(current.c_str(), permissions) == 0) {
+      continue;
+    }
+    const int error = errno;
+    // Another process may have made it in between.
+    if (!isExistingDirectory(current)) {
+      return LMRError::fromErrno(error, path.string());
+    }
+  }
+  return nullptr;
+}
+
+bool isExistingDirectory(const std::filesystem::path& path) {
+  std::error_code ignored;
+  return std::filesystem::is_directory(path, ignored);
+}
+
+} // namespace lumora::backend

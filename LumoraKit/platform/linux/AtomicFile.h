@@ -1,0 +1,24 @@
+#pragma once
+
+#include <LumoraKit/platform/LMRError.h>
+
+#include <filesystem>
+#include <string_view>
+
+#include <sys/types.h>
+
+namespace lumora::backend {
+
+/// Puts a file with this content at the path, readable by the user only: written under a temporary name in the same
+/// folder, flushed to the disk, moved into place. At any moment the path holds the old content or the new one, also
+/// after a crash of the machine. Null on success; after a failure nothing has changed.
+LUMORA_INTERNAL LMRErrorRef replaceFile(const std::filesystem::path& path, std::string_view content);
+
+/// Makes a folder with its missing parents, with these permissions less the umask. Null on success, also when it is
+/// there already.
+LUMORA_INTERNAL LMRErrorRef makeDirectories(const std::filesystem::path& path, mode_t permissions);
+
+/// Whether the path leads to a folder.
+LUMORA_INTERNAL bool isExistingDirectory(const std::filesystem::path& path);
+
+} // namespace lumora::backend

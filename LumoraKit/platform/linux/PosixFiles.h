@@ -1,0 +1,19 @@
+#pragma once
+
+#include <LumoraKit/platform/Files.h>
+
+namespace lumora::backend {
+
+/// Files of the local file system. Errors are in the POSIX domain. Folders are made with the default permissions (the
+/// umask decides), files are readable by the user only.
+class LUMORA_INTERNAL PosixFiles final : public Files {
+public:
+  /// The XDG data folder.
+  std::vector<std::filesystem::path> applicationSupportDirectories() override;
+  bool isDirectory(const std::filesystem::path& path) override;
+  LMRErrorRef createDirectory(const std::filesystem::path& path) override;
+  LMRErrorRef writeAtomically(const std::filesystem::path& path, std::string_view content) override;
+  LMRErrorRef removeFile(const std::filesystem::path& path) override;
+};
+
+} // namespace lumora::backend

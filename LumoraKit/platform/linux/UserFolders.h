@@ -1,0 +1,17 @@
+#pragma once
+
+#include <LumoraKit/platform/Export.h>
+
+#include <filesystem>
+
+/// \file
+/// The current user's folders, as the XDG Base Directory Specification says. An empty path when there is none.
+
+namespace lumora::backend {
+
+/// $XDG_CONFIG_HOME, else ~/.config.
+LUMORA_INTERNAL std::filesystem::path userConfigurationFolder();
+/// $XDG_DATA_HOME, else ~/.local/share.
+LUMORA_INTERNAL std::filesystem::path userDataFolder();
+
+} // namespace lumora::backend
