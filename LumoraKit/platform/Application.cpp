@@ -1,0 +1,7 @@
+#include <LumoraKit/platform/Application.h>
+
+namespace lumora {
+
+Application::~Application() = default;
+
+} // namespace lumora

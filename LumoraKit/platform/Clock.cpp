@@ -1,0 +1,7 @@
+#include <LumoraKit/platform/Clock.h>
+
+namespace lumora {
+
+WallClock::~WallClock() = default;
+
+} // namespace lumora
