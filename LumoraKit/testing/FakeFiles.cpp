@@ -1,0 +1,109 @@
+#include <LumoraKit/testing/FakeFiles.h>
+
+#include <cerrno>
+
+namespace lumora::fakes {
+namespace {
+
+// A path without dots and without a separator at its end.
+std::filesystem::path cleaned(const std::filesystem::path& path) {
+  auto clean = path.lexically_normal();
+  return clean.has_filename() || clean == clean.root_path() ? clean : clean.parent_path();
+}
+
+LMRErrorRef errorUnlessZero(int errorNumber, const std::filesystem::path& path) {
+  return errorNumber == 0 ? nullptr : LMRError::fromErrno(errorNumber, path.string());
+}
+
+} // namespace
+
+FakeFiles::FakeFiles() : applicationSupport_{"/home/user/.local/share"} {}
+FakeFiles::~FakeFiles() = default;
+
+std::vector<std::filesystem::path> FakeFiles::applicationSupportDirectories() {
+  const std::lock_guard lock(mutex_);
+  return applicationSupport_;
+}
+
+bool FakeFiles::isDirectory(const std::filesystem::path& path) {
+  const std::lock_guard lock(mutex_);
+  return hasDirectory(cleaned(path));
+}
+
+LMRErrorRef FakeFiles::createDirectory(const std::filesystem::path& path) {
+  const std::lock_guard lock(mutex_);
+  const auto clean = cleaned(path);
+  if (hasDirectory(clean)) {
+    return nullptr;
+  }
+  return errorUnlessZero(failure_ != 0 ? failure_ : createParents(clean), path);
+}
+
+LMRErrorRef FakeFiles::writeAtomically(const std::filesystem::path& path, std::string_view content) {
+  const std::lock_guard lock(mutex_);
+  const auto clean = cleaned(path);
+  int error = failure_;
+  if (error == 0 && !hasDirectory(clean.parent_path())) {
+    error = ENOENT;
+  }
+  if (error == 0 && hasDirectory(clean)) {
+    error = EISDIR;
+  }
+  if (error == 0) {
+    files_[clean] = content;
+  }
+  return errorUnlessZero(error, path);
+}
+
+LMRErrorRef FakeFiles::removeFile(const std::filesystem::path& path) {
+  const std::lock_guard lock(mutex_);
+  const auto clean = cleaned(path);
+  int error = failure_;
+  if (error == 0 && files_.erase(clean) == 0) {
+    error = hasDirectory(clean) ? EISDIR : ENOENT;
+  }
+  return errorUnlessZero(error, path);
+}
+
+void FakeFiles::setApplicationSupportDirectories(std::vector<std::filesystem::path> directories) {
+  const std::lock_guard lock(mutex_);
+  applicationSupport_ = std::move(directories);
+}
+
+void FakeFiles::setFailure(int errorNumber) {
+  const std::lock_guard lock(mutex_);
+  failure_ = errorNumber;
+}
+
+std::optional<std::string> FakeFiles::content(const std::filesystem::path& path) const {
+  const std::lock_guard lock(mutex_);
+  const auto found = files_.find(cleaned(path));
+  return found == files_.end() ? std::nullopt : std::optional(found->second);
+}
+
+std::vector<std::filesystem::path> FakeFiles::files() const {
+  const std::lock_guard lock(mutex_);
+  std::vector<std::filesystem::path> paths;
+  for (const auto& [path, content] : files_) {
+    paths.push_back(path);
+  }
+  return paths;
+}
+
+bool FakeFiles::hasDirectory(const std::filesystem::path& path) const {
+  return directories_.count(path) > 0;
+}
+
+int FakeFiles::createParents(const std::filesystem::path& path) {
+  std::filesystem::path current;
+  for (const auto& part : path) {
+    current /= part;
+    if (files_.count(current) > 0) {
+      return current == path ? EEXIST : ENOTDIR;
+    }
+    directories_.insert(current);
+  }
+  return 0;
+}
+
+} // namespace lumora::fakes

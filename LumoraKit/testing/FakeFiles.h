@@ -1,0 +1,48 @@
+#pragma once
+
+#include <LumoraKit/platform/Files.h>
+
+#include <map>
+#include <mutex>
+#include <optional>
+#include <set>
+#include <string>
+#include <vector>
+
+namespace lumora::fakes {
+
+/// A file system in memory; nothing reaches a disk. It begins with the root folder alone. Any thread.
+class LUMORA_EXPORT FakeFiles final : public Files {
+public:
+  FakeFiles();
+  ~FakeFiles() override;
+
+  std::vector<std::filesystem::path> applicationSupportDirectories() override;
+  bool isDirectory(const std::filesystem::path& path) override;
+  LMRErrorRef createDirectory(const std::filesystem::path& path) override;
+  LMRErrorRef writeAtomically(const std::filesystem::path& path, std::string_view content) override;
+  LMRErrorRef removeFile(const std::filesystem::path& path) override;
+
+  /// One folder, "/home/user/.local/share", unless set.
+  void setApplicationSupportDirectories(std::vector<std::filesystem::path> directories);
+  /// While set, whatever would change something fails with this errno: ENOSPC for a full disk, EROFS for one that is
+  /// read only. 0 ends it.
+  void setFailure(int errorNumber);
+
+  /// The content of a file; nothing when there is none.
+  std::optional<std::string> content(const std::filesystem::path& path) const;
+  /// The paths of all files, sorted.
+  std::vector<std::filesystem::path> files() const;
+
+private:
+  bool hasDirectory(const std::filesystem::path& path) const;
+  int createParents(const std::filesystem::path& path);
+
+  mutable std::mutex mutex_;
+  std::vector<std::filesystem::path> applicationSupport_;
+  std::set<std::filesystem::path> directories_{"/"};
+  std::map<std::filesystem::path, std::string> files_;
+  int failure_ = 0;
+};
+
+} // namespace lumora::fakes

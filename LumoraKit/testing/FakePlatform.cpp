@@ -1,0 +1,25 @@
+#include <LumoraKit/testing/FakePlatform.h>
+
+namespace lumora::fakes {
+
+FakePlatform::FakePlatform() : previous_(Platform::current()) {
+  install();
+}
+
+FakePlatform::~FakePlatform() {
+  Platform::install(previous_);
+}
+
+void FakePlatform::install() const {
+  Platform platform = previous_;
+  platform.application = application;
+  platform.files = files;
+  platform.log = log;
+  platform.notificationCenter = notificationCenter;
+  platform.preferences = preferences;
+  platform.toolRunner = toolRunner;
+  platform.wallClock = wallClock;
+  Platform::install(platform);
+}
+
+} // namespace lumora::fakes
