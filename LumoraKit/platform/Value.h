@@ -67,7 +67,6 @@ public:
   const Data* data() const;
   const Array* array() const;
   const Dictionary* dictionary() const;
-  std::string* string();
   Array* array();
   Dictionary* dictionary();
 

@@ -1,3 +1,0 @@
-#include <LumoraKit/platform/KTActionLoggingProtocol.h>
-
-KTActionLoggingProtocol::~KTActionLoggingProtocol() = default;

@@ -1,0 +1,90 @@
+#include "../store/Faults.h"
+#include "Commands.h"
+
+#include <iostream>
+#include <memory>
+
+namespace lumora::sandbox {
+
+namespace {
+
+struct Options {
+  std::string root;
+  std::string command = "*";
+  std::int64_t latency = 0;
+  std::int64_t status = 0;
+  std::string message;
+  std::int64_t times = 0;
+};
+
+void inject(const Options& options, Fault::Kind kind, std::int64_t value) {
+  Store store = Store::open(options.root);
+  Fault fault{0, options.command, kind, value, std::nullopt, std::nullopt};
+  if (!options.message.empty()) {
+    fault.message = options.message;
+  }
+  if (options.times > 0) {
+    fault.remaining = options.times;
+  }
+  addFault(store, fault);
+}
+
+void list(const Options& options) {
+  Store store = Store::open(options.root);
+  for (const auto& fault : faults(store)) {
+    std::cout << fault.id << '\t' << fault.command << '\t' << nameOf(fault.kind) << '\t' << fault.value << '\t'
+              << (fault.remaining ? std::to_string(*fault.remaining) + " times" : "always") << '\t'
+              << fault.message.value_or("") << '\n';
+  }
+}
+
+void clear(const Options& options) {
+  Store store = Store::open(options.root);
+  clearFaults(store);
+}
+
+CLI::App& addKind(CLI::App& group, const std::string& name, const std::string& text,
+                  const std::shared_ptr<Options>& options) {
+  auto& command = *group.add_subcommand(name, text);
+  addRootArgument(command, options->root);
+  command.add_option("--command", options->command, "command word it strikes; * is every command")
+      ->capture_default_str();
+  command.add_option("--times", options->times, "how many runs it strikes; without it every one")
+      ->check(CLI::PositiveNumber);
+  return command;
+}
+
+void addFailure(CLI::App& group, const std::shared_ptr<Options>& options) {
+  constexpr int highestStatus = 255;
+  auto& failure = addKind(group, "failure", "End with a status", options);
+  failure.add_option("--status", options->status, "exit status")->required()->check(CLI::Range(1, highestStatus));
+  failure.add_option("--message", options->message, "text for standard error");
+  failure.callback([options] { inject(*options, Fault::Kind::Failure, options->status); });
+}
+
+} // namespace
+
+void addInjectCommand(CLI::App& program) {
+  auto options = std::make_shared<Options>();
+  auto& group = *program.add_subcommand("inject", "Make the tools fail as real servers do")->require_subcommand(1);
+
+  auto& latency = addKind(group, "latency", "Answer late", options);
+  latency.add_option("--milliseconds", options->latency, "how late")->required()->check(CLI::NonNegativeNumber);
+  latency.callback([options] { inject(*options, Fault::Kind::Latency, options->latency); });
+
+  addFailure(group, options);
+  addKind(group, "garbage", "Do the work, but reply with what is no property list", options).callback([options] {
+    inject(*options, Fault::Kind::Garbage, 0);
+  });
+  addKind(group, "hang", "Never answer", options).callback([options] { inject(*options, Fault::Kind::Hang, 0); });
+
+  auto& listing = *group.add_subcommand("list", "List the faults: number, command, kind, value, times, message");
+  addRootArgument(listing, options->root);
+  listing.callback([options] { list(*options); });
+
+  auto& clearing = *group.add_subcommand("clear", "Remove all faults");
+  addRootArgument(clearing, options->root);
+  clearing.callback([options] { clear(*options); });
+}
+
+} // namespace lumora::sandbox

@@ -1,0 +1,40 @@
+#include "../submission/Submission.h"
+#include "Command.h"
+
+namespace lumora::sandbox {
+
+namespace {
+
+Dictionary reply(const std::string& uuid, const char* state) {
+  return {{"uuid", uuid}, {"state", state}};
+}
+
+Dictionary fileAndReport(Context& context, Submission submission) {
+  const Filed filed = fileNow(context.store, std::move(submission));
+  for (const auto& path : filed.remaining) {
+    context.remarks.push_back(path + " was submitted but could not be removed");
+  }
+  return reply(filed.episodeUUID, "completed");
+}
+
+} // namespace
+
+Dictionary submit(Context& context, const Arguments& arguments) {
+  const SubmissionRequest request{arguments.texts("file"), arguments.text("metadata"),
+                                  arguments.optionalText("recording_metadata"), arguments.optionalText("workflow"),
+                                  arguments.optionalText("submission_uuid")};
+  Submission submission = prepare(context.store, request, *context.user);
+  submission.removesSources = arguments.has("delete");
+  if (arguments.has("async")) {
+    return reply(fileInBackground(context.store, std::move(submission)), "uploading");
+  }
+  return fileAndReport(context, std::move(submission));
+}
+
+Dictionary submitWorkflow(Context& context, const Arguments& arguments) {
+  const SubmissionRequest request{arguments.texts("input"), arguments.text("metadata"), std::nullopt,
+                                  arguments.text("workflow"), std::nullopt};
+  return fileAndReport(context, prepare(context.store, request, *context.user));
+}
+
+} // namespace lumora::sandbox

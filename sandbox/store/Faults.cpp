@@ -1,0 +1,88 @@
+#include "Faults.h"
+
+#include <array>
+
+namespace lumora::sandbox {
+
+namespace {
+
+constexpr std::array<std::string_view, 4> kindNames{"latency", "failure", "garbage", "hang"};
+
+Fault::Kind kindNamed(const std::string& name) {
+  std::size_t index = 0;
+  while (kindNames.at(index) != name) {
+    ++index;
+  }
+  return static_cast<Fault::Kind>(index);
+}
+
+Fault faultFrom(SQLite::Statement& row) {
+  Fault fault{row.getColumn(0).getInt64(),
+              row.getColumn(1).getString(),
+              kindNamed(row.getColumn(2).getString()),
+              row.getColumn(3).getInt64(),
+              std::nullopt,
+              std::nullopt};
+  if (const auto message = row.getColumn(4); !message.isNull()) {
+    fault.message = message.getString();
+  }
+  if (const auto remaining = row.getColumn(5); !remaining.isNull()) {
+    fault.remaining = remaining.getInt64();
+  }
+  return fault;
+}
+
+std::vector<Fault> faultsFrom(SQLite::Statement row) {
+  std::vector<Fault> all;
+  while (row.executeStep()) {
+    all.push_back(faultFrom(row));
+  }
+  return all;
+}
+
+std::vector<Fault> faultsFor(Store& store, const std::string& command) {
+  return faultsFrom(store.query("SELECT id, command, kind, value, message, remaining FROM faults "
+                                "WHERE command IN (?, '*') ORDER BY id",
+                                command));
+}
+
+} // namespace
+
+std::string_view nameOf(Fault::Kind kind) {
+  return kindNames.at(static_cast<std::size_t>(kind));
+}
+
+void addFault(Store& store, const Fault& fault) {
+  auto statement = store.query("INSERT INTO faults (command, kind, value, message, remaining) VALUES (?, ?, ?, ?, ?)",
+                               fault.command, std::string(nameOf(fault.kind)), fault.value, fault.message);
+  if (fault.remaining) {
+    statement.bind(5, *fault.remaining);
+  }
+  statement.exec();
+}
+
+void clearFaults(Store& store) {
+  store.execute("DELETE FROM faults");
+}
+
+std::vector<Fault> faults(Store& store) {
+  return faultsFrom(store.query("SELECT id, command, kind, value, message, remaining FROM faults ORDER BY id"));
+}
+
+std::vector<Fault> takeFaults(Store& store, const std::string& command) {
+  // Nearly always there are none; only then is no write lock taken.
+  auto struck = faultsFor(store, command);
+  if (struck.empty()) {
+    return struck;
+  }
+  store.change([&] {
+    struck = faultsFor(store, command);
+    for (const auto& fault : struck) {
+      store.execute("UPDATE faults SET remaining = remaining - 1 WHERE id = ?", fault.id);
+    }
+    store.execute("DELETE FROM faults WHERE remaining <= 0");
+  });
+  return struck;
+}
+
+} // namespace lumora::sandbox

@@ -1,0 +1,107 @@
+#include "Staging.h"
+
+#include "../Status.h"
+#include "../store/Uploads.h"
+#include "FileCopy.h"
+
+#include <cerrno>
+#include <system_error>
+
+#include <fcntl.h>
+#include <sys/file.h>
+#include <unistd.h>
+
+namespace lumora::sandbox {
+
+namespace fs = std::filesystem;
+
+namespace {
+
+constexpr const char* interrupted = "the transfer was interrupted";
+
+int openFolder(const fs::path& folder) {
+  return open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+}
+
+/// Removes a staging folder that no process holds.
+void clearIncoming(Store& store, const fs::path& folder) {
+  const int lock = openFolder(folder);
+  if (lock < 0) {
+    return;
+  }
+  if (flock(lock, LOCK_EX | LOCK_NB) == 0) {
+    std::error_code ignored;
+    fs::remove_all(folder, ignored);
+    failUpload(store, folder.filename().string(), interrupted);
+  }
+  close(lock);
+}
+
+/// Removes a filed folder whose process died before the episode was recorded.
+void clearUnrecorded(Store& store, const fs::path& folder) {
+  const std::string uuid = folder.filename().string();
+  if (!episodeExists(store, uuid)) {
+    std::error_code ignored;
+    fs::remove_all(folder, ignored);
+    failUpload(store, uuid, interrupted);
+  }
+}
+
+} // namespace
+
+Staging::Staging(const Store& store) : store_(store) {
+  while (!makeFolder()) {
+  }
+}
+
+Staging::~Staging() {
+  if (!isKept_) {
+    std::error_code ignored;
+    fs::remove_all(folder_, ignored);
+  }
+  close(lock_);
+}
+
+/// False when somebody cleared the folder away before it was locked.
+bool Staging::makeFolder() {
+  uuid_ = makeUUIDString();
+  folder_ = store_.incomingFolder() / uuid_;
+  fs::create_directory(folder_);
+  lock_ = openFolder(folder_);
+  if (lock_ < 0 && errno != ENOENT) {
+    throw std::system_error(errno, std::generic_category(), folder_.string());
+  }
+  if (lock_ >= 0 && flock(lock_, LOCK_EX) == 0 && fs::exists(folder_)) {
+    return true;
+  }
+  close(lock_);
+  return false;
+}
+
+StoredFile Staging::add(const fs::path& source) {
+  // Numbered, because files from several folders may have one name.
+  const std::string name = source.filename().string();
+  const std::string storedName = std::to_string(++count_) + "-" + name;
+  const Copied copied = copyFile(source, folder_ / storedName);
+  return {name, storedName, copied.size, copied.sha256};
+}
+
+void Staging::publish() {
+  const fs::path filed = folderOf(store_, uuid_);
+  fs::rename(folder_, filed);
+  folder_ = filed;
+}
+
+void clearAway(Store& store) {
+  for (const auto& entry : fs::directory_iterator(store.incomingFolder())) {
+    clearIncoming(store, entry.path());
+  }
+  // A folder is filed and recorded in one change: none is halfway while this one lasts.
+  store.change([&] {
+    for (const auto& entry : fs::directory_iterator(store.submissionsFolder())) {
+      clearUnrecorded(store, entry.path());
+    }
+  });
+}
+
+} // namespace lumora::sandbox
