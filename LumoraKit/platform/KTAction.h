@@ -31,26 +31,30 @@ using KTActionRef = std::shared_ptr<KTAction>;
 ///     if (action->error()) { ... }
 ///
 /// A subclass overrides startExecution() and calls finish() once its work is done, after setError() when it failed.
+///
 /// The end has one order: the error is final, stopExecution() runs, isRunning() turns false and its observers are
-/// told, then one target is told: the error target when there is an error, else the finish target. The end is
-/// delivered on the queue that start() was called on (the main queue, or the serial queue of the calling task), on a
-/// worker when the caller had none, and on the calling thread by runSynchronously(). A second finish() is ignored.
+/// told, then one target is told, once: the error target when there is an error, else the finish target. After
+/// start() the end is delivered on the queue that start() was called on (the main queue, or the serial queue of the
+/// calling task), on a worker when the caller had none. It comes on a later turn of that queue, never inside
+/// start(), and waits for as long as nobody serves the queue. After runSynchronously() it is delivered on the calling
+/// thread, before the return.
 class LUMORA_EXPORT KTAction : public std::enable_shared_from_this<KTAction> {
 public:
   KTAction(const KTAction&) = delete;
   KTAction& operator=(const KTAction&) = delete;
   virtual ~KTAction();
 
-  /// Begins the action and returns at once. An action runs once: a second start is a programming error (asserted).
-  /// Any thread.
+  /// Begins the action and returns at once. An action is run once, by this or by runSynchronously(): a second time is
+  /// a programming error (asserted). Any thread.
   void start();
-  /// Runs the action and returns after it has ended and its target has been told. Blocks. Any thread.
+  /// Runs the action, with startExecution() on the calling thread, and returns after it has ended and its target has
+  /// been told. Blocks. Any thread.
   void runSynchronously();
 
-  /// Whom to tell of the end: a member function of `target` that takes nothing, or the action as
-  /// `const std::shared_ptr<A>&` with A this class or the action's own (any other is asserted). The target is held
-  /// weakly: one that died is not told. A null target clears. To be set before the start, or on the queue that the end
-  /// is delivered on.
+  /// Whom to tell of the end: `selector` is a member function of `target`, or of a base class of it, that takes
+  /// nothing, or the action as `const std::shared_ptr<A>&` with A this class or one that the action is of (any other
+  /// is asserted). The target is held weakly: one that died is not told. A null target clears. The last one set before
+  /// the end counts. Any thread.
   template <class Target, class Selector>
   void setFinishTarget_selector(const std::shared_ptr<Target>& target, Selector selector) {
     setFinishMessage(message(target, selector));
@@ -59,12 +63,13 @@ public:
   void setErrorTarget_selector(const std::shared_ptr<Target>& target, Selector selector) {
     setErrorMessage(message(target, selector));
   }
-  /// Clears the finish target.
+  /// Clears the target: nobody is told of that outcome.
   void setFinishTarget(std::nullptr_t);
   void setErrorTarget(std::nullptr_t);
 
-  /// Null while the action has not failed. Any thread. What is set after finish() was called is ignored.
+  /// Null while the action has not failed. Any thread.
   LMRErrorRef error() const { return error_.get(); }
+  /// Sets what the action will fail with; null: it will succeed. Ignored once finish() was called. Any thread.
   void setError(LMRErrorRef error);
 
   /// The progress text for the user. Any thread.
@@ -77,9 +82,10 @@ public:
 
   /// True from the start until just before the target is told. Any thread.
   bool isRunning() const { return running_.load(std::memory_order_acquire); }
-  /// Calls the observer after each change of isRunning(), on the thread that changed it.
+  /// Calls the observer after each change of isRunning(), on the thread that changed it: the one that starts the
+  /// action, and the one that the end is delivered on. Any thread.
   [[nodiscard]] lumora::Connection observeRunning(std::function<void()> observer);
-  /// Tells the observers of isRunning() although it did not change.
+  /// Tells the observers of isRunning() although it did not change. Any thread.
   void notifyRunningObservers();
 
 protected:
@@ -87,15 +93,17 @@ protected:
 
   KTAction();
 
-  /// Does the work, and sees to it that finish() is called in the end. Runs on a worker when executionBlocks(), else
-  /// on the thread that started the action.
+  /// Does the work, and sees to it that finish() is called in the end, here or later. Runs on a worker when
+  /// executionBlocks(), else inside start(); on the calling thread of runSynchronously().
   virtual void startExecution() = 0;
   /// Called once at the end, with error() final and isRunning() still true.
   virtual void stopExecution();
-  /// Whether startExecution() blocks its thread. True unless overridden; an action that only starts others says false.
+  /// Whether startExecution() blocks its thread. True unless overridden; an action that only starts others says
+  /// false.
   virtual bool executionBlocks() const;
 
-  /// To be called once by the subclass, on any thread.
+  /// Ends the action. To be called by the subclass once it is done, on any thread. Ignored before the start and after
+  /// the first call.
   void finish();
 
   /// Whether start() or runSynchronously() has been called.
@@ -103,11 +111,11 @@ protected:
   /// Whether the action is run by runSynchronously(). Of a started action.
   bool runsSynchronously() const { return !endQueue_; }
 
-  /// Starts an action that this one is made of: synchronously when this one is run synchronously, so that it needs
-  /// no queue, else with start().
+  /// Runs an action that this one is made of, the way this one is run: with runSynchronously(), so that no queue need
+  /// be served, or with start().
   void startPart(const KTActionRef& part);
 
-  /// Called after the part's own target has been told; for actions that are made of others.
+  /// Calls the observer once, after the part's own target has been told. To be set before the part is started.
   static void setEndObserver(const KTActionRef& part, std::function<void()> observer);
 
 private:

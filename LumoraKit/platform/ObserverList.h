@@ -11,7 +11,7 @@
 #include <vector>
 
 /// \file
-/// The list behind notifiers and the notification centre. Of the framework's own; not installed.
+/// The list behind notifiers and the notification centre: of the framework's own, not for applications.
 
 namespace lumora::detail {
 

@@ -83,6 +83,10 @@ const Dictionary* Value::dictionary() const {
   return box ? box->get() : nullptr;
 }
 
+std::string* Value::string() {
+  return std::get_if<std::string>(&storage_);
+}
+
 Array* Value::array() {
   auto* const box = std::get_if<std::unique_ptr<Array>>(&storage_);
   return box ? box->get() : nullptr;

@@ -67,6 +67,7 @@ public:
   const Data* data() const;
   const Array* array() const;
   const Dictionary* dictionary() const;
+  std::string* string();
   Array* array();
   Dictionary* dictionary();
 

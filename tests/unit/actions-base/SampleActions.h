@@ -24,11 +24,11 @@ public:
   static std::shared_ptr<SampleAction> composite(Work work) {
     return std::make_shared<SampleAction>(std::move(work), false);
   }
-  static std::shared_ptr<SampleAction> succeeding() {
-    return blocking([](SampleAction& action) { action.end(); });
-  }
-  static std::shared_ptr<SampleAction> failing() {
-    return blocking([](SampleAction& action) { action.fail(); });
+  static std::shared_ptr<SampleAction> succeeding() { return blocking(&SampleAction::end); }
+  static std::shared_ptr<SampleAction> failing() { return blocking(&SampleAction::fail); }
+  /// Ends when the test says so.
+  static std::shared_ptr<SampleAction> waiting() {
+    return composite([](SampleAction&) {});
   }
 
   SampleAction(Work work, bool blocks) : work_(std::move(work)), blocks_(blocks) {}
@@ -56,8 +56,20 @@ private:
   const bool blocks_;
 };
 
-/// A target that notes what it is told, in order, and where.
-class Listener {
+/// What happened, in order, and where the last of it did.
+class Story {
+public:
+  void note(std::string what) {
+    events.push_back(std::move(what));
+    thread = std::this_thread::get_id();
+  }
+
+  std::vector<std::string> events;
+  std::thread::id thread;
+};
+
+/// A target that notes what it is told.
+class Listener : public Story {
 public:
   void finished() { note("finished"); }
   void failed() { note("failed"); }
@@ -70,18 +82,15 @@ public:
     note("failed");
   }
 
-  void note(std::string what) {
-    told.push_back(std::move(what));
-    thread = std::this_thread::get_id();
-  }
-  void listenTo(const KTActionRef& action, const std::shared_ptr<Listener>& self) const {
-    action->setFinishTarget_selector(self, &Listener::finished);
-    action->setErrorTarget_selector(self, &Listener::failed);
-  }
-
-  std::vector<std::string> told;
-  std::thread::id thread;
   KTActionRef received;
 };
+
+/// A new listener that is both targets of the action.
+inline std::shared_ptr<Listener> listenerOf(KTAction& action) {
+  auto listener = std::make_shared<Listener>();
+  action.setFinishTarget_selector(listener, &Listener::finished);
+  action.setErrorTarget_selector(listener, &Listener::failed);
+  return listener;
+}
 
 } // namespace lumora::tests

@@ -1,0 +1,133 @@
+// The methods of LMRActionFactory that hand recordings to a workflow.
+#include <LumoraKit/actions/LMRActionFactory.h>
+#include <LumoraKit/actions/LMRActionFactoryAdditions.h>
+#include <LumoraKit/actions/LMRRequest.h>
+#include <LumoraKit/login/LMRLocalizedString.h>
+#include <LumoraKit/platform/Assert.h>
+
+#include <utility>
+
+using lumora::requestPair;
+
+namespace {
+
+using OptionalText = std::optional<std::string>;
+using OptionalMetadata = std::optional<lumora::Dictionary>;
+
+void require(bool holds, std::string_view condition, std::string_view operation) {
+  lumora::assertThat(holds, condition, operation, "LMRActionFactory");
+}
+
+lumora::Array flags(bool asynchronous, bool deleteAfterSubmission) {
+  lumora::Array arguments;
+  if (asynchronous) {
+    arguments.emplace_back(requestPair("async", std::nullopt));
+  }
+  if (deleteAfterSubmission) {
+    arguments.emplace_back(requestPair("delete", std::nullopt));
+  }
+  return arguments;
+}
+
+OptionalText writtenUserMetadata(const OptionalMetadata& metadata) {
+  return metadata ? LMRActionFactoryAdditions::writeToApplicationSupport(*metadata) : std::nullopt;
+}
+
+std::shared_ptr<LMRAction> submitAction(lumora::Array arguments, std::shared_ptr<LMRSession> session) {
+  auto action = LMRAction::actionWithCommand_arguments_session("submit", std::move(arguments), std::move(session));
+  action->setDescription(LMRLocalizedString("Submitting files\\U2026"));
+  action->setExpectXMLResponse(false);
+  return action;
+}
+
+// One file's submission; the destination is the last argument.
+lumora::Array fileArguments(const std::string& file, const OptionalMetadata& userMetadata,
+                            const OptionalMetadata& recordingMetadata, lumora::Array flags, lumora::Array destination) {
+  lumora::Array arguments = std::move(flags);
+  arguments.emplace_back(requestPair("file", file));
+  arguments.emplace_back(requestPair("metadata", writtenUserMetadata(userMetadata)));
+  if (recordingMetadata) {
+    const auto path = LMRActionFactoryAdditions::writeXMLToApplicationSupport(*recordingMetadata);
+    arguments.emplace_back(requestPair("recording_metadata", path));
+  }
+  arguments.emplace_back(std::move(destination));
+  return arguments;
+}
+
+std::shared_ptr<LMRAction> stopAction(const OptionalText& camera, const OptionalMetadata& userMetadata,
+                                      lumora::Array destination, std::shared_ptr<LMRSession> session,
+                                      std::string_view operation) {
+  const auto metadataFilePath = writtenUserMetadata(userMetadata);
+  require(metadataFilePath.has_value(), "metadataFilePath != nil", operation);
+  lumora::Array arguments{requestPair("stop", camera), requestPair("metadata", metadataFilePath),
+                          std::move(destination)};
+  auto action = LMRAction::actionWithCommand_arguments_session(std::nullopt, std::move(arguments), std::move(session));
+  action->setDescription(LMRLocalizedString("Stopping and submitting remote camera recording\\U2026"));
+  return action;
+}
+
+} // namespace
+
+std::shared_ptr<LMRAction> LMRActionFactory::
+    actionToSubmitFile_toWorkflow_userMetadata_recordingMetadata_asynchronous_deleteAfterSubmission_session(
+        const OptionalText& file, const OptionalText& workflowName, const OptionalMetadata& userMetadata,
+        const OptionalMetadata& recordingMetadata, bool asynchronous, bool deleteAfterSubmission,
+        std::shared_ptr<LMRSession> session) {
+  constexpr std::string_view operation =
+      "actionToSubmitFile:toWorkflow:userMetadata:recordingMetadata:asynchronous:deleteAfterSubmission:session:";
+  require(file.has_value(), "file != nil", operation);
+  require(workflowName.has_value(), "workflowName != nil", operation);
+  return submitAction(fileArguments(*file, userMetadata, recordingMetadata, flags(asynchronous, deleteAfterSubmission),
+                                    requestPair("workflow", *workflowName)),
+                      std::move(session));
+}
+
+std::shared_ptr<LMRAction> LMRActionFactory::
+    actionToSubmitFile_toSubmissionUUID_userMetadata_recordingMetadata_asynchronous_deleteAfterSubmission_session(
+        const OptionalText& file, const OptionalText& submissionUUID, const OptionalMetadata& userMetadata,
+        const OptionalMetadata& recordingMetadata, bool asynchronous, bool deleteAfterSubmission,
+        std::shared_ptr<LMRSession> session) {
+  constexpr std::string_view operation =
+      "actionToSubmitFile:toSubmissionUUID:userMetadata:recordingMetadata:asynchronous:deleteAfterSubmission:session:";
+  require(file.has_value(), "file != nil", operation);
+  require(submissionUUID.has_value(), "submissionUUID != nil", operation);
+  return submitAction(fileArguments(*file, userMetadata, recordingMetadata, flags(asynchronous, deleteAfterSubmission),
+                                    requestPair("submission_uuid", *submissionUUID)),
+                      std::move(session));
+}
+
+std::shared_ptr<LMRAction>
+LMRActionFactory::actionToSubmitFiles_toWorkflow_metadata_asynchronous_deleteAfterSubmission_session(
+    const std::vector<std::string>& files, const OptionalText& workflowName, const OptionalMetadata& userMetadata,
+    bool asynchronous, bool deleteAfterSubmission, std::shared_ptr<LMRSession> session) {
+  constexpr std::string_view operation =
+      "actionToSubmitFiles:toWorkflow:metadata:asynchronous:deleteAfterSubmission:session:";
+  require(!files.empty(), "[files count] > 0", operation);
+  require(workflowName.has_value(), "workflowName != nil", operation);
+  const auto metadataFilePath = writtenUserMetadata(userMetadata);
+  const bool isLibraryServer = session && session->isLumoraLibraryServer();
+  auto arguments = flags(asynchronous && !isLibraryServer, deleteAfterSubmission);
+  for (const auto& file : files) {
+    arguments.emplace_back(requestPair("file", file));
+  }
+  arguments.emplace_back(requestPair("metadata", metadataFilePath));
+  arguments.emplace_back(requestPair("workflow", *workflowName));
+  return submitAction(std::move(arguments), std::move(session));
+}
+
+std::shared_ptr<LMRAction> LMRActionFactory::actionToStopRemoteCamera_andSubmitToWorkflow_withMetadata_session(
+    const OptionalText& camera, const OptionalText& workflowName, const OptionalMetadata& userMetadata,
+    std::shared_ptr<LMRSession> session) {
+  constexpr std::string_view operation = "actionToStopRemoteCamera:andSubmitToWorkflow:withMetadata:session:";
+  require(workflowName.has_value(), "workflowName != nil", operation);
+  return stopAction(camera, userMetadata, requestPair("workflow", *workflowName), std::move(session), operation);
+}
+
+std::shared_ptr<LMRAction> LMRActionFactory::actionToStopRemoteCamera_andSubmitToSubmissionUUID_withMetadata_session(
+    const OptionalText& camera, const OptionalText& submissionUUID, const OptionalMetadata& userMetadata,
+    std::shared_ptr<LMRSession> session) {
+  constexpr std::string_view operation = "actionToStopRemoteCamera:andSubmitToSubmissionUUID:withMetadata:session:";
+  require(submissionUUID.has_value(), "submissionUUID != nil", operation);
+  return stopAction(camera, userMetadata, requestPair("submission_uuid", *submissionUUID), std::move(session),
+                    operation);
+}

@@ -1,0 +1,3 @@
+#include <LumoraKit/platform/KTActionLoggingProtocol.h>
+
+KTActionLoggingProtocol::~KTActionLoggingProtocol() = default;
