@@ -1,15 +1,17 @@
 # What an installation holds: the libraries, the public headers, the package files for CMake and pkg-config.
 
 include(CMakePackageConfigHelpers)
+set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${PROJECT_SOURCE_DIR}/LumoraKit/LumoraKit.h)
 
 install(TARGETS lumorakit lumorakit-testing EXPORT LumoraKitTargets)
-install(
-  DIRECTORY ${PROJECT_SOURCE_DIR}/LumoraKit
-  DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}
-  FILES_MATCHING
-  PATTERN "*.h"
-  PATTERN linux EXCLUDE
-  PATTERN resources EXCLUDE)
+# What LumoraKit.h includes is public, and nothing else is.
+file(STRINGS ${PROJECT_SOURCE_DIR}/LumoraKit/LumoraKit.h public_headers REGEX "^#include <LumoraKit/")
+list(TRANSFORM public_headers REPLACE "^#include <LumoraKit/(.*)>.*" "\\1")
+file(GLOB fakes CONFIGURE_DEPENDS RELATIVE ${PROJECT_SOURCE_DIR}/LumoraKit ${PROJECT_SOURCE_DIR}/LumoraKit/testing/*.h)
+foreach(header LumoraKit.h ${public_headers} ${fakes})
+  get_filename_component(folder ${header} DIRECTORY)
+  install(FILES ${PROJECT_SOURCE_DIR}/LumoraKit/${header} DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/LumoraKit/${folder})
+endforeach()
 
 set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/LumoraKit)
 install(EXPORT LumoraKitTargets NAMESPACE LumoraKit:: DESTINATION ${package_dir})
