@@ -16,7 +16,7 @@ run_packages=(
 # A camera, a microphone and a screen for machines that have none.
 headless_packages=(dbus pipewire pipewire-bin pipewire-pulse wireplumber libspa-0.2-modules xvfb)
 
-demo_packages=("${headless_packages[@]}" gstreamer1.0-tools)
+demo_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
 test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
 bench_packages=(libbenchmark-dev gstreamer1.0-tools bsdextrautils)
 lint_packages=(clang-14 clang-tidy-14 clang-format-14 libclang-rt-14-dev git python3)
