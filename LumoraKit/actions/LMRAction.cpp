@@ -76,10 +76,10 @@ std::string LMRAction::responseDescription() const {
 void LMRAction::startExecution() {
   const auto tool = this->tool();
   const auto session = this->session();
-  lumora::assertThat(tool.has_value(), "self.tool != nil", "startExecution", "LMRAction");
-  lumora::assertThat(!authorizationRef(), "self.authorizationRef == nil", "startExecution", "LMRAction");
+  lumora::assertThat(tool.has_value(), "self.tool != nil", __func__, "LMRAction");
+  lumora::assertThat(!authorizationRef(), "self.authorizationRef == nil", __func__, "LMRAction");
   lumora::assertThat(!session || session->authenticationType() != LMRAuthenticationTypeUnknown,
-                     "self.session.authenticationType != LMRAuthenticationTypeUnknown", "startExecution", "LMRAction");
+                     "self.session.authenticationType != LMRAuthenticationTypeUnknown", __func__, "LMRAction");
   const lumora::Request request{*tool, command(), arguments(), session};
   std::string refusal;
   if (const auto serialised = request.serialised(refusal)) {

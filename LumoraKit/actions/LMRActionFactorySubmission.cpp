@@ -21,10 +21,10 @@ void require(bool holds, std::string_view condition, std::string_view operation)
 lumora::Array flags(bool asynchronous, bool deleteAfterSubmission) {
   lumora::Array arguments;
   if (asynchronous) {
-    arguments.emplace_back(requestPair("async", std::nullopt));
+    arguments.push_back(requestPair("async", std::nullopt));
   }
   if (deleteAfterSubmission) {
-    arguments.emplace_back(requestPair("delete", std::nullopt));
+    arguments.push_back(requestPair("delete", std::nullopt));
   }
   return arguments;
 }
@@ -42,20 +42,20 @@ std::shared_ptr<LMRAction> submitAction(lumora::Array arguments, std::shared_ptr
 
 // One file's submission; the destination is the last argument.
 lumora::Array fileArguments(const std::string& file, const OptionalMetadata& userMetadata,
-                            const OptionalMetadata& recordingMetadata, lumora::Array flags, lumora::Array destination) {
+                            const OptionalMetadata& recordingMetadata, lumora::Array flags, lumora::Value destination) {
   lumora::Array arguments = std::move(flags);
-  arguments.emplace_back(requestPair("file", file));
-  arguments.emplace_back(requestPair("metadata", writtenUserMetadata(userMetadata)));
+  arguments.push_back(requestPair("file", file));
+  arguments.push_back(requestPair("metadata", writtenUserMetadata(userMetadata)));
   if (recordingMetadata) {
     const auto path = LMRActionFactoryAdditions::writeXMLToApplicationSupport(*recordingMetadata);
-    arguments.emplace_back(requestPair("recording_metadata", path));
+    arguments.push_back(requestPair("recording_metadata", path));
   }
-  arguments.emplace_back(std::move(destination));
+  arguments.push_back(std::move(destination));
   return arguments;
 }
 
 std::shared_ptr<LMRAction> stopAction(const OptionalText& camera, const OptionalMetadata& userMetadata,
-                                      lumora::Array destination, std::shared_ptr<LMRSession> session,
+                                      lumora::Value destination, std::shared_ptr<LMRSession> session,
                                       std::string_view operation) {
   const auto metadataFilePath = writtenUserMetadata(userMetadata);
   require(metadataFilePath.has_value(), "metadataFilePath != nil", operation);
@@ -73,10 +73,8 @@ std::shared_ptr<LMRAction> LMRActionFactory::
         const OptionalText& file, const OptionalText& workflowName, const OptionalMetadata& userMetadata,
         const OptionalMetadata& recordingMetadata, bool asynchronous, bool deleteAfterSubmission,
         std::shared_ptr<LMRSession> session) {
-  constexpr std::string_view operation =
-      "actionToSubmitFile:toWorkflow:userMetadata:recordingMetadata:asynchronous:deleteAfterSubmission:session:";
-  require(file.has_value(), "file != nil", operation);
-  require(workflowName.has_value(), "workflowName != nil", operation);
+  require(file.has_value(), "file != nil", __func__);
+  require(workflowName.has_value(), "workflowName != nil", __func__);
   return submitAction(fileArguments(*file, userMetadata, recordingMetadata, flags(asynchronous, deleteAfterSubmission),
                                     requestPair("workflow", *workflowName)),
                       std::move(session));
@@ -87,10 +85,8 @@ std::shared_ptr<LMRAction> LMRActionFactory::
         const OptionalText& file, const OptionalText& submissionUUID, const OptionalMetadata& userMetadata,
         const OptionalMetadata& recordingMetadata, bool asynchronous, bool deleteAfterSubmission,
         std::shared_ptr<LMRSession> session) {
-  constexpr std::string_view operation =
-      "actionToSubmitFile:toSubmissionUUID:userMetadata:recordingMetadata:asynchronous:deleteAfterSubmission:session:";
-  require(file.has_value(), "file != nil", operation);
-  require(submissionUUID.has_value(), "submissionUUID != nil", operation);
+  require(file.has_value(), "file != nil", __func__);
+  require(submissionUUID.has_value(), "submissionUUID != nil", __func__);
   return submitAction(fileArguments(*file, userMetadata, recordingMetadata, flags(asynchronous, deleteAfterSubmission),
                                     requestPair("submission_uuid", *submissionUUID)),
                       std::move(session));
@@ -100,34 +96,30 @@ std::shared_ptr<LMRAction>
 LMRActionFactory::actionToSubmitFiles_toWorkflow_metadata_asynchronous_deleteAfterSubmission_session(
     const std::vector<std::string>& files, const OptionalText& workflowName, const OptionalMetadata& userMetadata,
     bool asynchronous, bool deleteAfterSubmission, std::shared_ptr<LMRSession> session) {
-  constexpr std::string_view operation =
-      "actionToSubmitFiles:toWorkflow:metadata:asynchronous:deleteAfterSubmission:session:";
-  require(!files.empty(), "[files count] > 0", operation);
-  require(workflowName.has_value(), "workflowName != nil", operation);
+  require(!files.empty(), "[files count] > 0", __func__);
+  require(workflowName.has_value(), "workflowName != nil", __func__);
   const auto metadataFilePath = writtenUserMetadata(userMetadata);
   const bool isLibraryServer = session && session->isLumoraLibraryServer();
   auto arguments = flags(asynchronous && !isLibraryServer, deleteAfterSubmission);
   for (const auto& file : files) {
-    arguments.emplace_back(requestPair("file", file));
+    arguments.push_back(requestPair("file", file));
   }
-  arguments.emplace_back(requestPair("metadata", metadataFilePath));
-  arguments.emplace_back(requestPair("workflow", *workflowName));
+  arguments.push_back(requestPair("metadata", metadataFilePath));
+  arguments.push_back(requestPair("workflow", *workflowName));
   return submitAction(std::move(arguments), std::move(session));
 }
 
 std::shared_ptr<LMRAction> LMRActionFactory::actionToStopRemoteCamera_andSubmitToWorkflow_withMetadata_session(
     const OptionalText& camera, const OptionalText& workflowName, const OptionalMetadata& userMetadata,
     std::shared_ptr<LMRSession> session) {
-  constexpr std::string_view operation = "actionToStopRemoteCamera:andSubmitToWorkflow:withMetadata:session:";
-  require(workflowName.has_value(), "workflowName != nil", operation);
-  return stopAction(camera, userMetadata, requestPair("workflow", *workflowName), std::move(session), operation);
+  require(workflowName.has_value(), "workflowName != nil", __func__);
+  return stopAction(camera, userMetadata, requestPair("workflow", *workflowName), std::move(session), __func__);
 }
 
 std::shared_ptr<LMRAction> LMRActionFactory::actionToStopRemoteCamera_andSubmitToSubmissionUUID_withMetadata_session(
     const OptionalText& camera, const OptionalText& submissionUUID, const OptionalMetadata& userMetadata,
     std::shared_ptr<LMRSession> session) {
-  constexpr std::string_view operation = "actionToStopRemoteCamera:andSubmitToSubmissionUUID:withMetadata:session:";
-  require(submissionUUID.has_value(), "submissionUUID != nil", operation);
+  require(submissionUUID.has_value(), "submissionUUID != nil", __func__);
   return stopAction(camera, userMetadata, requestPair("submission_uuid", *submissionUUID), std::move(session),
-                    operation);
+                    __func__);
 }

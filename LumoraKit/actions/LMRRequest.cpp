@@ -15,11 +15,11 @@ bool takesCommandWord(std::string_view tool) {
 void appendCredentials(Array& request, const LMRSession& session, bool withAuthenticationWord) {
   const bool byPassword = session.authenticationType() == LMRAuthenticationTypePassword;
   if (withAuthenticationWord) {
-    request.emplace_back(requestPair("auth", Value(byPassword ? "Password" : "Kerberos")));
+    request.push_back(requestPair("auth", Value(byPassword ? "Password" : "Kerberos")));
   }
   if (byPassword) {
-    request.emplace_back(requestPair("user", session.userName()));
-    request.emplace_back(requestPair("pass", session.password()));
+    request.push_back(requestPair("user", session.userName()));
+    request.push_back(requestPair("pass", session.password()));
   }
 }
 
@@ -27,11 +27,11 @@ Array elements(const Request& request) {
   const bool wordy = takesCommandWord(request.tool);
   Array elements;
   if (request.session) {
-    elements.emplace_back(requestPair("server", hostAndPort(request.session->server(), request.session->port())));
+    elements.push_back(requestPair("server", hostAndPort(request.session->server(), request.session->port())));
     appendCredentials(elements, *request.session, wordy);
   }
   if (request.command) {
-    elements.emplace_back(wordy ? Value(*request.command) : Value(requestPair("subcommand", *request.command)));
+    elements.push_back(wordy ? Value(*request.command) : requestPair("subcommand", *request.command));
   }
   if (request.arguments) {
     elements.insert(elements.end(), request.arguments->begin(), request.arguments->end());
@@ -62,7 +62,7 @@ std::string refusalReason(const Array& elements) {
 
 } // namespace
 
-Array requestPair(std::string_view key, std::optional<Value> value) {
+Value requestPair(std::string_view key, std::optional<Value> value) {
   Array pair;
   pair.reserve(2);
   pair.emplace_back(key);

@@ -15,7 +15,7 @@
 namespace lumora {
 
 /// The argument ("key", value), or ("key") when the value is absent: lists end at their first absent element.
-LUMORA_INTERNAL Array requestPair(std::string_view key, std::optional<Value> value);
+LUMORA_INTERNAL Value requestPair(std::string_view key, std::optional<Value> value);
 
 /// "host:port".
 LUMORA_INTERNAL std::string hostAndPort(const std::optional<std::string>& host, std::uint16_t port);

@@ -14,15 +14,15 @@ LMRFrameworkUserDefaults::LMRFrameworkUserDefaults(std::optional<std::string> bu
     : bundleIdentifier_(std::move(bundleIdentifier)) {}
 
 std::optional<lumora::Value> LMRFrameworkUserDefaults::objectForKey(std::string_view key) const {
-  return lumora::Platform::current().preferences->value(domain("objectForKey:"), key);
+  return lumora::Platform::current().preferences->value(domain(__func__), key);
 }
 
 void LMRFrameworkUserDefaults::setObject_forKey(const std::optional<lumora::Value>& value, std::string_view key) {
-  lumora::Platform::current().preferences->setValue(domain("setObject:forKey:"), key, value);
+  lumora::Platform::current().preferences->setValue(domain(__func__), key, value);
 }
 
 void LMRFrameworkUserDefaults::removeObjectForKey(std::string_view key) {
-  lumora::Platform::current().preferences->setValue(domain("removeObjectForKey:"), key, std::nullopt);
+  lumora::Platform::current().preferences->setValue(domain(__func__), key, std::nullopt);
 }
 
 std::string LMRFrameworkUserDefaults::domain(std::string_view operation) const {
