@@ -2,6 +2,7 @@
 #include <LumoraKit/platform/PropertyListBuilder.h>
 #include <LumoraKit/platform/ValueText.h>
 
+#include <algorithm>
 #include <iterator>
 #include <utility>
 
@@ -14,6 +15,10 @@ std::string_view trimmed(std::string_view text) {
   const std::size_t first = text.find_first_not_of(whiteSpace);
   return first == std::string_view::npos ? std::string_view()
                                          : text.substr(first, text.find_last_not_of(whiteSpace) - first + 1);
+}
+
+bool isWhiteSpace(std::string_view text) {
+  return std::all_of(text.begin(), text.end(), [](char c) { return c == ' ' || c == '\t' || c == '\n' || c == '\r'; });
 }
 
 // Long texts are cut, at a character's start, to keep a message readable.
@@ -153,8 +158,7 @@ bool PropertyListBuilder::characters(std::string_view text) {
     text_ += text;
     return true;
   }
-  return text.find_first_not_of(whiteSpace) == std::string_view::npos ||
-         fail(PropertyListError::WrongStructure, "text outside a value");
+  return isWhiteSpace(text) || fail(PropertyListError::WrongStructure, "text outside a value");
 }
 
 bool PropertyListBuilder::endElement() {

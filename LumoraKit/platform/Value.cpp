@@ -29,17 +29,15 @@ Value::Value(double number) : storage_(number) {}
 
 Value::Value(Date date) : storage_(date) {}
 
-Value::Value(Data bytes) : storage_(std::make_unique<Data>(std::move(bytes))) {}
+Value::Value(Data bytes) : storage_(std::move(bytes)) {}
 
-Value::Value(Array elements) : storage_(std::make_unique<Array>(std::move(elements))) {}
+Value::Value(Array elements) : storage_(std::move(elements)) {}
 
-Value::Value(Dictionary entries) : storage_(std::make_unique<Dictionary>(std::move(entries))) {}
+Value::Value(Dictionary entries) : storage_(std::move(entries)) {}
 
 Value::Value(const Value& other) : storage_(false) {
   Internals::copy(other, *this);
 }
-
-Value::Value(Value&& other) noexcept = default;
 
 Value& Value::operator=(const Value& other) {
   return *this = Value(other);
@@ -52,16 +50,13 @@ Value& Value::operator=(Value&& other) noexcept {
   return *this;
 }
 
-Value::~Value() {
-  if (array() || dictionary()) {
-    Internals::dismantle(*this);
-  }
+void Value::dismantle() noexcept {
+  Internals::dismantle(*this);
 }
 
+// The places of a storage are in the order of the types.
 Value::Type Value::type() const {
-  static constexpr Type types[] = {Type::String, Type::Integer, Type::UnsignedInteger, Type::Real,      Type::Boolean,
-                                   Type::Date,   Type::Data,    Type::Array,           Type::Dictionary};
-  return types[storage_.index()];
+  return static_cast<Type>(storage_.index());
 }
 
 const std::string* Value::string() const {
@@ -69,18 +64,15 @@ const std::string* Value::string() const {
 }
 
 const Data* Value::data() const {
-  const auto* const box = std::get_if<std::unique_ptr<Data>>(&storage_);
-  return box ? box->get() : nullptr;
+  return std::get_if<Data>(&storage_);
 }
 
 const Array* Value::array() const {
-  const auto* const box = std::get_if<std::unique_ptr<Array>>(&storage_);
-  return box ? box->get() : nullptr;
+  return std::get_if<Array>(&storage_);
 }
 
 const Dictionary* Value::dictionary() const {
-  const auto* const box = std::get_if<std::unique_ptr<Dictionary>>(&storage_);
-  return box ? box->get() : nullptr;
+  return std::get_if<Dictionary>(&storage_);
 }
 
 std::string* Value::string() {
@@ -88,13 +80,11 @@ std::string* Value::string() {
 }
 
 Array* Value::array() {
-  auto* const box = std::get_if<std::unique_ptr<Array>>(&storage_);
-  return box ? box->get() : nullptr;
+  return std::get_if<Array>(&storage_);
 }
 
 Dictionary* Value::dictionary() {
-  auto* const box = std::get_if<std::unique_ptr<Dictionary>>(&storage_);
-  return box ? box->get() : nullptr;
+  return std::get_if<Dictionary>(&storage_);
 }
 
 std::optional<bool> Value::boolean() const {

@@ -20,7 +20,6 @@
 namespace lumora {
 
 class Value;
-class Dictionary;
 
 /// An ordered list of values.
 using Array = std::vector<Value>;
@@ -31,10 +30,55 @@ using Data = std::vector<std::uint8_t>;
 /// A moment in UTC with the resolution of a property list: whole seconds.
 using Date = std::chrono::sys_seconds;
 
+/// A property-list dictionary: string keys, each once, in the order of their first insertion.
+class LUMORA_EXPORT Dictionary {
+public:
+  using Entry = std::pair<std::string, Value>;
+
+  Dictionary();
+  Dictionary(std::initializer_list<Entry> entries);
+  Dictionary(const Dictionary& other);
+  Dictionary(Dictionary&& other) noexcept;
+  Dictionary& operator=(const Dictionary& other);
+  Dictionary& operator=(Dictionary&& other) noexcept;
+  ~Dictionary();
+
+  /// A dictionary of entries in which a repeated key keeps the place of its first and the value of its last entry.
+  static Dictionary fromEntries(std::vector<Entry> entries);
+
+  bool empty() const;
+  std::size_t size() const;
+  std::vector<Entry>::const_iterator begin() const;
+  std::vector<Entry>::const_iterator end() const;
+
+  /// The value of a key, or null.
+  const Value* find(std::string_view key) const;
+  Value* find(std::string_view key);
+  bool contains(std::string_view key) const;
+
+  /// The string under a key; nothing when the key is absent or its value is not a string.
+  std::optional<std::string> string(std::string_view key) const;
+  /// The dictionary or array under a key, or null when absent or of another type.
+  const Dictionary* dictionary(std::string_view key) const;
+  const Array* array(std::string_view key) const;
+
+  /// Replaces the value of a key in its place, or appends the pair.
+  void set(std::string_view key, Value value);
+  /// Removes a key; true when it was there.
+  bool remove(std::string_view key);
+
+  /// The same keys with equal values, in whatever order.
+  friend LUMORA_EXPORT bool operator==(const Dictionary& left, const Dictionary& right);
+
+private:
+  friend class Value;
+  std::vector<Entry> entries_;
+};
+
 /// One property-list value. A value type: copies are deep, moves are cheap, and nesting of any depth is copied,
 /// compared, described and destroyed without recursion. Signed and unsigned integers are kept apart only where it
 /// matters: an integer that fits std::int64_t is always held as such, so that equal numbers compare equal whatever they
-/// were made from. A moved-from value may only be assigned to or destroyed.
+/// were made from.
 class LUMORA_EXPORT Value {
 public:
   enum class Type { String, Integer, UnsignedInteger, Real, Boolean, Date, Data, Array, Dictionary };
@@ -92,55 +136,18 @@ public:
 private:
   friend LUMORA_EXPORT bool operator==(const Dictionary& left, const Dictionary& right);
   struct Internals;
-  // Boxed collections keep a value small; a box is never null except in a moved-from value.
-  using Storage = std::variant<std::string, std::int64_t, std::uint64_t, double, bool, Date, std::unique_ptr<Data>,
-                               std::unique_ptr<Array>, std::unique_ptr<Dictionary>>;
+  void dismantle() noexcept;
+  // In the order of Type.
+  using Storage = std::variant<std::string, std::int64_t, std::uint64_t, double, bool, Date, Data, Array, Dictionary>;
   Storage storage_;
 };
 
-/// A property-list dictionary: string keys, each once, in the order of their first insertion.
-class LUMORA_EXPORT Dictionary {
-public:
-  using Entry = std::pair<std::string, Value>;
-
-  Dictionary();
-  Dictionary(std::initializer_list<Entry> entries);
-  Dictionary(const Dictionary& other);
-  Dictionary(Dictionary&& other) noexcept;
-  Dictionary& operator=(const Dictionary& other);
-  Dictionary& operator=(Dictionary&& other) noexcept;
-  ~Dictionary();
-
-  /// A dictionary of entries in which a repeated key keeps the place of its first and the value of its last entry.
-  static Dictionary fromEntries(std::vector<Entry> entries);
-
-  bool empty() const;
-  std::size_t size() const;
-  std::vector<Entry>::const_iterator begin() const;
-  std::vector<Entry>::const_iterator end() const;
-
-  /// The value of a key, or null.
-  const Value* find(std::string_view key) const;
-  Value* find(std::string_view key);
-  bool contains(std::string_view key) const;
-
-  /// The string under a key; nothing when the key is absent or its value is not a string.
-  std::optional<std::string> string(std::string_view key) const;
-  /// The dictionary or array under a key, or null when absent or of another type.
-  const Dictionary* dictionary(std::string_view key) const;
-  const Array* array(std::string_view key) const;
-
-  /// Replaces the value of a key in its place, or appends the pair.
-  void set(std::string_view key, Value value);
-  /// Removes a key; true when it was there.
-  bool remove(std::string_view key);
-
-  /// The same keys with equal values, in whatever order.
-  friend LUMORA_EXPORT bool operator==(const Dictionary& left, const Dictionary& right);
-
-private:
-  friend class Value;
-  std::vector<Entry> entries_;
-};
+// Inline, because collections of values move and destroy them all the time.
+inline Value::Value(Value&& other) noexcept = default;
+inline Value::~Value() {
+  if (storage_.index() >= static_cast<std::size_t>(Type::Array)) {
+    dismantle();
+  }
+}
 
 } // namespace lumora

@@ -26,10 +26,6 @@ bool sameReal(double left, double right) {
 
 } // namespace
 
-bool Value::Internals::isCollection(const Value& value) {
-  return value.array() || value.dictionary();
-}
-
 void Value::Internals::copy(const Value& from, Value& to) {
   std::vector<Copy> left;
   copyOne(from, to, left);
@@ -42,12 +38,10 @@ void Value::Internals::copy(const Value& from, Value& to) {
 
 void Value::Internals::copyOne(const Value& from, Value& to, std::vector<Copy>& left) {
   const auto assign = [&]<class T>(const T& content) {
-    if constexpr (std::is_same_v<T, std::unique_ptr<Array>>) {
-      copyArray(*content, to, left);
-    } else if constexpr (std::is_same_v<T, std::unique_ptr<Dictionary>>) {
-      copyDictionary(*content, to, left);
-    } else if constexpr (std::is_same_v<T, std::unique_ptr<Data>>) {
-      to.storage_ = std::make_unique<Data>(*content);
+    if constexpr (std::is_same_v<T, Array>) {
+      copyArray(content, to.storage_.emplace<Array>(), left);
+    } else if constexpr (std::is_same_v<T, Dictionary>) {
+      copyDictionary(content, to.storage_.emplace<Dictionary>(), left);
     } else {
       to.storage_ = content;
     }
@@ -55,59 +49,59 @@ void Value::Internals::copyOne(const Value& from, Value& to, std::vector<Copy>& 
   std::visit(assign, from.storage_);
 }
 
-// The elements are made first and never move again, so that those left to fill can be pointed at.
-void Value::Internals::copyArray(const Array& from, Value& to, std::vector<Copy>& left) {
-  auto elements = std::make_unique<Array>();
-  elements->reserve(from.size());
+// All elements are made in the room reserved for them and never move again, so those left to fill can be pointed at.
+void Value::Internals::copyArray(const Array& from, Array& to, std::vector<Copy>& left) {
+  to.reserve(from.size());
   for (const Value& element : from) {
-    Value& copied = elements->emplace_back(false);
-    if (isCollection(element)) {
-      left.push_back({&element, &copied});
-    } else {
-      copyOne(element, copied, left);
-    }
+    copyInside(element, to.emplace_back(false), left);
   }
-  to.storage_ = std::move(elements);
 }
 
-void Value::Internals::copyDictionary(const Dictionary& from, Value& to, std::vector<Copy>& left) {
-  auto dictionary = std::make_unique<Dictionary>();
-  dictionary->entries_.reserve(from.size());
+void Value::Internals::copyDictionary(const Dictionary& from, Dictionary& to, std::vector<Copy>& left) {
+  to.entries_.reserve(from.size());
   for (const auto& [key, value] : from) {
-    Value& copied = dictionary->entries_.emplace_back(key, false).second;
-    if (isCollection(value)) {
-      left.push_back({&value, &copied});
-    } else {
-      copyOne(value, copied, left);
+    copyInside(value, to.entries_.emplace_back(key, false).second, left);
+  }
+}
+
+void Value::Internals::copyInside(const Value& from, Value& to, std::vector<Copy>& left) {
+  if (isCollection(from)) {
+    left.push_back({&from, &to});
+  } else {
+    copyOne(from, to, left);
+  }
+}
+
+// What holds collections itself is taken out and waits its turn; it leaves an empty collection behind. The destructors
+// that follow find one flat level.
+void Value::Internals::dismantle(Value& value) noexcept {
+  std::vector<Value> waiting;
+  takeNested(value, waiting);
+  while (!waiting.empty()) {
+    Value next = std::move(waiting.back());
+    waiting.pop_back();
+    takeNested(next, waiting);
+  }
+}
+
+template <class Visit> void Value::Internals::forEachInside(Value& value, Visit visit) {
+  if (auto* const array = std::get_if<Array>(&value.storage_)) {
+    std::for_each(array->begin(), array->end(), visit);
+  } else if (auto* const dictionary = std::get_if<Dictionary>(&value.storage_)) {
+    for (auto& entry : dictionary->entries_) {
+      visit(entry.second);
     }
   }
-  to.storage_ = std::move(dictionary);
 }
 
-// What is taken out leaves a null box behind, so the destructors that follow find nothing to do.
-void Value::Internals::dismantle(Value& value) noexcept {
-  std::vector<Value> taken;
-  takeCollections(value, taken);
-  while (!taken.empty()) {
-    Value next = std::move(taken.back());
-    taken.pop_back();
-    takeCollections(next, taken);
-  }
-}
-
-void Value::Internals::takeCollections(Value& value, std::vector<Value>& taken) {
-  const auto take = [&taken](Value& inside) {
-    if (isCollection(inside)) {
+void Value::Internals::takeNested(Value& value, std::vector<Value>& taken) {
+  forEachInside(value, [&taken](Value& inside) {
+    bool nested = false;
+    forEachInside(inside, [&nested](Value& innermost) { nested |= isCollection(innermost); });
+    if (nested) {
       taken.push_back(std::move(inside));
     }
-  };
-  if (Array* const array = value.array()) {
-    std::for_each(array->begin(), array->end(), take);
-  } else if (Dictionary* const dictionary = value.dictionary()) {
-    for (auto& entry : dictionary->entries_) {
-      take(entry.second);
-    }
-  }
+  });
 }
 
 bool Value::Internals::equal(const Value& left, const Value& right) {
@@ -139,8 +133,6 @@ bool Value::Internals::equalOne(const Value& left, const Value& right, std::vect
     return pairElements(*left.array(), *right.array(), inside);
   case Type::Dictionary:
     return pairEntries(*left.dictionary(), *right.dictionary(), inside);
-  case Type::Data:
-    return *left.data() == *right.data();
   case Type::Real:
     return sameReal(*left.real(), *right.real());
   default:
