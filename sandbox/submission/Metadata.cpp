@@ -18,12 +18,13 @@ namespace {
 }
 
 std::string contentOf(const std::filesystem::path& path) {
+  // A folder or a named pipe would open as well.
+  std::error_code ignored;
   std::ifstream stream(path, std::ios::binary);
-  std::string content{std::istreambuf_iterator<char>(stream), {}};
-  if (!stream.is_open() || stream.bad() || std::filesystem::is_directory(path)) {
+  if (!std::filesystem::is_regular_file(path, ignored) || !stream) {
     refuse(path, "the metadata cannot be read");
   }
-  return content;
+  return {std::istreambuf_iterator<char>(stream), {}};
 }
 
 std::size_t attributeCount(const pugi::xml_node& node) {
