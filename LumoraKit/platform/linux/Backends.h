@@ -1,5 +1,7 @@
 #pragma once
 
+#include <LumoraKit/platform/Export.h>
+
 #include <memory>
 
 /// \file
@@ -26,13 +28,13 @@ std::shared_ptr<Files> makeFiles();
 /// syslog(3).
 std::shared_ptr<Log> makeSystemLog();
 /// GLib's default main context.
-std::shared_ptr<MainThread> makeMainThread();
+LUMORA_INTERNAL std::shared_ptr<MainThread> makeMainThread();
 /// GStreamer; initialised when first asked for a device.
 std::shared_ptr<MediaCapture> makeMediaCapture();
 /// One property-list file a domain below the XDG configuration folder.
 std::shared_ptr<Preferences> makePreferences();
 /// An elastic pool of threads.
-std::shared_ptr<Queues> makeQueues(std::shared_ptr<MainThread> mainThread);
+LUMORA_INTERNAL std::shared_ptr<Queues> makeQueues(std::shared_ptr<MainThread> mainThread);
 /// posix_spawn(3), poll(2) and a process descriptor.
 std::shared_ptr<ToolRunner> makeToolRunner();
 /// CLOCK_REALTIME.

@@ -122,6 +122,10 @@ std::shared_ptr<WorkQueue> ElasticQueues::currentQueue() {
 
 void ElasticQueues::runAfter(std::chrono::nanoseconds delay, std::shared_ptr<WorkQueue> queue, Task task) {
   assertThat(queue != nullptr, "queue != nil", "runAfter", "Queues");
+  if (delay <= std::chrono::nanoseconds::zero()) {
+    queue->async(std::move(task));
+    return;
+  }
   delayedTasks_->runAfter(
       delay, [queue = std::move(queue), task = std::move(task)]() mutable { queue->async(std::move(task)); });
 }

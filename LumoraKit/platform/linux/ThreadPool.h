@@ -18,7 +18,7 @@ class DelayedTasks;
 using ThreadStarter = std::function<bool(Task body)>;
 
 /// Starts a detached thread that leaves the process's signals to the application's own threads.
-bool startThread(Task body);
+LUMORA_INTERNAL bool startThread(Task body);
 
 /// Threads without a limit: a task never waits for a thread that another task blocks. A thread that had nothing to do
 /// for a while ends. When the machine gives no more threads, tasks wait for one that becomes free, and new threads are
