@@ -14,6 +14,7 @@ using lumora::tests::Listener;
 using lumora::tests::listenerOf;
 using lumora::tests::SampleAction;
 using lumora::tests::serveUntil;
+using lumora::tests::waiterFor;
 using testing::ElementsAre;
 using testing::IsEmpty;
 
@@ -155,36 +156,35 @@ TEST(ActionEnd, isDeliveredOnTheSerialQueue_whenStartedThere) {
   const auto& queues = Platform::current().queues;
   const auto queue = queues->makeSerialQueue("caller");
   const auto action = SampleAction::succeeding();
-  std::promise<std::shared_ptr<lumora::WorkQueue>> where;
-  action->whenStopping = [&](SampleAction&) { where.set_value(queues->currentQueue()); };
-  queue->async([&] { action->start(); });
-  EXPECT_EQ(where.get_future().get(), queue);
+  const auto waiter = waiterFor(*action);
+  std::shared_ptr<lumora::WorkQueue> where;
+  action->whenStopping = [&](SampleAction&) { where = queues->currentQueue(); };
+  queue->async([action] { action->start(); });
+  waiter->wait();
+  EXPECT_EQ(where, queue);
 }
 
 TEST(ActionEnd, comesAfterTheTaskThatStarted_whenStartedOnASerialQueue) {
   const auto queue = Platform::current().queues->makeSerialQueue("caller");
   const auto action = SampleAction::composite(&SampleAction::end);
-  const auto listener = listenerOf(*action);
-  std::atomic<bool> told{false};
-  queue->async([&] {
+  const auto waiter = waiterFor(*action);
+  const auto story = std::make_shared<lumora::tests::Story>();
+  action->whenStopping = [=](SampleAction&) { story->note("end"); };
+  queue->async([=] {
     action->start();
-    listener->note("task");
+    story->note("task");
   });
-  queue->async([&] { told = true; });
-  ASSERT_TRUE(serveUntil([&] { return told.load(); }));
-  EXPECT_THAT(listener->events, ElementsAre("task", "finished"));
+  waiter->wait();
+  EXPECT_THAT(story->events, ElementsAre("task", "end"));
 }
 
 TEST(ActionEnd, isDeliveredOnAWorker_whenTheCallerHadNoQueue) {
   const auto action = SampleAction::composite(&SampleAction::end);
-  std::promise<std::thread::id> where;
-  action->whenStopping = [&](SampleAction&) { where.set_value(std::this_thread::get_id()); };
-  std::thread::id caller;
-  std::thread([&] {
-    caller = std::this_thread::get_id();
-    action->start();
-  }).join();
-  const auto thread = where.get_future().get();
-  EXPECT_NE(thread, caller);
-  EXPECT_NE(thread, std::this_thread::get_id());
+  const auto waiter = waiterFor(*action);
+  std::thread::id where;
+  action->whenStopping = [&](SampleAction&) { where = std::this_thread::get_id(); };
+  std::jthread caller([&] { action->start(); });
+  waiter->wait();
+  EXPECT_NE(where, caller.get_id());
+  EXPECT_NE(where, std::this_thread::get_id());
 }

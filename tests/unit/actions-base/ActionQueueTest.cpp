@@ -6,13 +6,12 @@
 
 #include <gmock/gmock.h>
 
-#include <atomic>
 #include <thread>
 
-using lumora::tests::Listener;
 using lumora::tests::SampleAction;
 using lumora::tests::serveUntil;
 using lumora::tests::Story;
+using lumora::tests::waiterFor;
 using testing::ElementsAre;
 using testing::IsEmpty;
 
@@ -151,27 +150,25 @@ TEST_F(ActionQueue, livesUntilTheEnd_whenTheCallerDropsIt) {
 TEST_F(ActionQueue, runsOnTheSerialQueue_whenStartedThere) {
   const auto& queues = lumora::Platform::current().queues;
   const auto serial = queues->makeSerialQueue("caller");
-  std::atomic<int> onCaller{0};
+  const auto waiter = waiterFor(*queue_);
+  int onCaller = 0;
   for (int i = 0; i < 3; ++i) {
     const auto action = SampleAction::succeeding();
     action->whenStopping = [&](SampleAction&) { onCaller += queues->currentQueue() == serial; };
     queue_->queueAction(action);
   }
-  std::atomic<bool> started{false};
-  serial->async([&] {
-    queue_->start();
-    started = true;
-  });
-  ASSERT_TRUE(serveUntil([&] { return started && !queue_->isRunning(); }));
+  serial->async([queue = queue_] { queue->start(); });
+  waiter->wait();
   EXPECT_EQ(onCaller, 3);
 }
 
-TEST_F(ActionQueue, runsEverything_whenStartedOnAThreadWithoutAQueue) {
+TEST_F(ActionQueue, runsEverythingInOrder_whenStartedOnAThreadWithoutAQueue) {
+  const auto waiter = waiterFor(*queue_);
   add(SampleAction::succeeding(), "first");
   add(SampleAction::succeeding(), "second");
   std::thread([&] { queue_->start(); }).join();
-  ASSERT_TRUE(serveUntil([&] { return !queue_->isRunning(); }));
-  EXPECT_EQ(queue_->error(), nullptr);
+  waiter->wait();
+  EXPECT_THAT(story_.events, ElementsAre("first finished", "second finished"));
 }
 
 TEST_F(ActionQueue, runsThousandsOfActions_whenRunSynchronously) {

@@ -4,6 +4,7 @@
 
 #include <functional>
 #include <memory>
+#include <semaphore>
 #include <string>
 #include <thread>
 #include <utility>
@@ -84,6 +85,24 @@ public:
 
   KTActionRef received;
 };
+
+/// A target that lets a test wait for an end that comes on another thread.
+class EndWaiter {
+public:
+  void told() { ended_.release(); }
+  void wait() { ended_.acquire(); }
+
+private:
+  std::binary_semaphore ended_{0};
+};
+
+/// A new waiter that is both targets of the action.
+inline std::shared_ptr<EndWaiter> waiterFor(KTAction& action) {
+  auto waiter = std::make_shared<EndWaiter>();
+  action.setFinishTarget_selector(waiter, &EndWaiter::told);
+  action.setErrorTarget_selector(waiter, &EndWaiter::told);
+  return waiter;
+}
 
 /// A new listener that is both targets of the action.
 inline std::shared_ptr<Listener> listenerOf(KTAction& action) {
