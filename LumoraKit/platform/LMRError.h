@@ -12,6 +12,8 @@ inline constexpr std::string_view LMRErrorDomain = "org.vantor.Lumora";
 inline constexpr std::string_view LMRRecorderErrorDomain = "org.vantor.LumoraRecorder";
 /// Domain of failed system calls; the code is errno.
 inline constexpr std::string_view LMRPosixErrorDomain = "POSIX";
+/// Domain of errors of the machine's capture system; the code is a lumora::CaptureErrorCode.
+inline constexpr std::string_view LMRCaptureErrorDomain = "org.vantor.LumoraCapture";
 
 /// Key of the localised description in LMRError::userInfo.
 inline constexpr std::string_view LMRLocalizedDescriptionKey = "LocalizedDescription";

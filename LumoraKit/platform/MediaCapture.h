@@ -23,6 +23,36 @@ enum class MediaType { Video, Sound, Muxed };
 /// Ticks of the host clock: nanoseconds of CLOCK_MONOTONIC.
 using HostTime = std::uint64_t;
 
+/// Codes of the errors in LMRCaptureErrorDomain.
+enum class CaptureErrorCode : std::int64_t {
+  /// No device with that identifier is there (any more).
+  DeviceMissing = 1,
+  /// The device, or the system service that it is reached through, refused or failed.
+  DeviceFailed = 2,
+  /// The device did not open, or did not stop, within 5 seconds.
+  DeviceTimedOut = 3,
+  /// The device gave no sample for 2 seconds.
+  DeviceSilent = 4,
+  /// The system put another device in its place.
+  DeviceReplaced = 5,
+  /// The screen cannot be captured here.
+  ScreenUnavailable = 6,
+  /// A request that the object does not take in its state: an input that is in another session, a second addition.
+  NotPossible = 7,
+  /// No encoder for the wanted codec works on this machine.
+  EncoderMissing = 8,
+  /// Encoding or muxing failed.
+  EncodingFailed = 9,
+  /// The file cannot be made or written.
+  FileNotWritable = 10,
+  /// No space is left for the file; what was written stays playable.
+  DiskFull = 11,
+  /// The recording ended before a sample came.
+  NothingRecorded = 12,
+  /// The file could not be completed in time; what was written stays playable.
+  FinishTimedOut = 13,
+};
+
 /// A camera, microphone or muxed device. Its identifier is the same after a restart of the device, the sound server
 /// or the machine.
 class LUMORA_EXPORT CaptureDevice {
