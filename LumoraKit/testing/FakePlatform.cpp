@@ -15,6 +15,7 @@ void FakePlatform::install() const {
   platform.application = application;
   platform.files = files;
   platform.log = log;
+  platform.mediaCapture = mediaCapture;
   platform.notificationCenter = notificationCenter;
   platform.preferences = preferences;
   platform.toolRunner = toolRunner;

@@ -4,6 +4,7 @@
 #include <LumoraKit/platform/Platform.h>
 #include <LumoraKit/testing/FakeApplication.h>
 #include <LumoraKit/testing/FakeFiles.h>
+#include <LumoraKit/testing/FakeMediaCapture.h>
 #include <LumoraKit/testing/FakePreferences.h>
 #include <LumoraKit/testing/FakeToolRunner.h>
 #include <LumoraKit/testing/FakeWallClock.h>
@@ -13,9 +14,9 @@
 
 namespace lumora::fakes {
 
-/// A whole platform of fakes, installed while it lives: no server, no disk, no log daemon. The main thread and the
-/// queues are the machine's. At the end the platform that was installed before is installed again; nothing of the
-/// framework may be running then.
+/// A whole platform of fakes, installed while it lives: no server, no disk, no log daemon, no camera. The main thread
+/// and the queues are the machine's. At the end the platform that was installed before is installed again; nothing of
+/// the framework may be running then.
 ///
 ///     lumora::fakes::FakePlatform platform;
 ///     platform.toolRunner->reply("listinfo", ToolReply::failure(26));
@@ -31,6 +32,7 @@ struct LUMORA_EXPORT FakePlatform {
   std::shared_ptr<FakeApplication> application = std::make_shared<FakeApplication>();
   std::shared_ptr<FakeFiles> files = std::make_shared<FakeFiles>();
   std::shared_ptr<RecordingLog> log = std::make_shared<RecordingLog>();
+  std::shared_ptr<FakeMediaCapture> mediaCapture = std::make_shared<FakeMediaCapture>();
   std::shared_ptr<NotificationCenter> notificationCenter = std::make_shared<NotificationCenter>();
   std::shared_ptr<FakePreferences> preferences = std::make_shared<FakePreferences>();
   std::shared_ptr<FakeToolRunner> toolRunner = std::make_shared<FakeToolRunner>();
