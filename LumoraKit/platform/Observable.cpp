@@ -9,7 +9,7 @@ Connection Observers::add(std::function<void(const std::any& object)> told) {
   observer->told = std::move(told);
   const std::lock_guard lock(mutex_);
   list_.push_back(observer);
-  return Connection(weak_from_this(), std::move(observer));
+  return {weak_from_this(), std::move(observer)};
 }
 
 void Observers::remove(const std::shared_ptr<Observer>& observer) {

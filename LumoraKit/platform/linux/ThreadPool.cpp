@@ -1,7 +1,6 @@
 #include <LumoraKit/platform/linux/DelayedTasks.h>
 #include <LumoraKit/platform/linux/ThreadPool.h>
 
-#include <chrono>
 #include <csignal>
 #include <system_error>
 #include <thread>
@@ -10,7 +9,6 @@
 namespace lumora::backend {
 namespace {
 
-constexpr std::chrono::seconds idleTime{5};
 constexpr std::chrono::milliseconds retryInterval{20};
 
 // Blocks every signal that is not raised by a thread's own fault; a new thread inherits the mask.
@@ -29,7 +27,7 @@ public:
   SignalsBlocked& operator=(const SignalsBlocked&) = delete;
 
 private:
-  sigset_t before_;
+  sigset_t before_{};
 };
 
 } // namespace
@@ -44,8 +42,8 @@ bool startThread(Task body) {
   }
 }
 
-ThreadPool::ThreadPool(std::shared_ptr<DelayedTasks> retries, ThreadStarter start)
-    : retries_(std::move(retries)), start_(std::move(start)) {}
+ThreadPool::ThreadPool(std::shared_ptr<DelayedTasks> retries, ThreadStarter start, std::chrono::milliseconds idleTime)
+    : retries_(std::move(retries)), start_(std::move(start)), idleTime_(idleTime) {}
 
 void ThreadPool::post(Task task, Priority priority) {
   {
@@ -105,7 +103,7 @@ void ThreadPool::work() {
 // False when nothing came for a while.
 bool ThreadPool::waitForTask(std::unique_lock<std::mutex>& lock) {
   ++idle_;
-  const bool found = posted_.wait_for(lock, idleTime, [this] { return !highTasks_.empty() || !tasks_.empty(); });
+  const bool found = posted_.wait_for(lock, idleTime_, [this] { return !highTasks_.empty() || !tasks_.empty(); });
   --idle_;
   return found;
 }

@@ -3,6 +3,7 @@
 #include <LumoraKit/platform/Export.h>
 #include <LumoraKit/platform/MainThread.h>
 
+#include <chrono>
 #include <condition_variable>
 #include <cstddef>
 #include <deque>
@@ -27,7 +28,8 @@ class LUMORA_INTERNAL ThreadPool : public std::enable_shared_from_this<ThreadPoo
 public:
   enum class Priority { Ordinary, High };
 
-  ThreadPool(std::shared_ptr<DelayedTasks> retries, ThreadStarter start);
+  ThreadPool(std::shared_ptr<DelayedTasks> retries, ThreadStarter start,
+             std::chrono::milliseconds idleTime = std::chrono::seconds(5));
 
   /// Returns at once. Any thread.
   void post(Task task, Priority priority);
@@ -42,6 +44,7 @@ private:
 
   const std::shared_ptr<DelayedTasks> retries_;
   const ThreadStarter start_;
+  const std::chrono::milliseconds idleTime_;
   std::mutex mutex_;
   std::condition_variable posted_;
   std::deque<Task> highTasks_;

@@ -4,6 +4,7 @@
 #include <gmock/gmock.h>
 
 #include <atomic>
+#include <chrono>
 #include <csignal>
 #include <memory>
 #include <mutex>
@@ -29,21 +30,27 @@ public:
       refused_.release();
       return false;
     }
-    return startThread(std::move(body));
+    return startThread([this, body = std::move(body)] {
+      body();
+      ended_.release();
+    });
   }
   void give(int threads) { left_ += threads; }
+  void waitForEndOfAThread() { ended_.acquire(); }
   void waitForRefusal() { refused_.acquire(); }
 
 private:
   std::atomic<int> left_;
   std::counting_semaphore<> refused_{0};
+  std::counting_semaphore<> ended_{0};
 };
 
 class Pool : public testing::Test {
 protected:
-  void make(int threads) {
+  void make(int threads, std::chrono::milliseconds idleTime = std::chrono::seconds(5)) {
     machine_ = std::make_shared<Machine>(threads);
-    pool_ = std::make_shared<ThreadPool>(retries_, [machine = machine_](Task body) { return machine->start(body); });
+    pool_ = std::make_shared<ThreadPool>(
+        retries_, [machine = machine_](Task body) { return machine->start(std::move(body)); }, idleTime);
   }
   ~Pool() override { retries_->stopWhenEmpty(); }
 
@@ -115,6 +122,20 @@ TEST_F(Pool, usesAnIdleThread_whenThereIsOne) {
     post([=] { ended->release(); });
     ended->acquire();
   }
+}
+
+TEST_F(Pool, threadEnds_whenItHadNothingToDoForAWhile) {
+  make(2, std::chrono::milliseconds(1));
+  for (int i = 0; i < 2; ++i) {
+    const auto ran = std::make_shared<std::binary_semaphore>(0);
+    post([=] { ran->release(); });
+    ran->acquire();
+    machine_->waitForEndOfAThread();
+  }
+  // The machine has given both threads: the second task had one of its own.
+  post([] {});
+  machine_->waitForRefusal();
+  machine_->give(1);
 }
 
 TEST_F(Pool, losesNoTask_whenTheMachineRefusesNowAndThen) {
