@@ -1,5 +1,7 @@
 #pragma once
 
+#include "support/ToolArguments.h"
+
 #include <LumoraKit/actions/LMRAction.h>
 #include <LumoraKit/testing/FakePlatform.h>
 
@@ -20,13 +22,6 @@ inline std::shared_ptr<LMRSession> kerberosSession() {
   auto session = passwordSession();
   session->setAuthenticationType(LMRAuthenticationTypeSingleSignOn);
   return session;
-}
-
-/// An argument with a key word and values.
-template <class... Values> Value pair(Values&&... values) {
-  Array elements;
-  (elements.emplace_back(std::forward<Values>(values)), ...);
-  return elements;
 }
 
 /// Runs actions against a tool that answers from a script.
