@@ -1,0 +1,121 @@
+#include <LumoraKit/actions/LMRStatusCodes.h>
+#include <LumoraKit/login/LMRLocalizedTables.h>
+#include <LumoraKit/testing/FakePlatform.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <regex>
+#include <set>
+#include <string>
+
+using lumora::LocalizedTable;
+using lumora::localizedTables;
+using testing::UnorderedElementsAre;
+
+namespace {
+
+const std::string escapedEllipsis = "\\U2026";
+const std::string ellipsis = "…";
+
+const LocalizedTable& table(std::string_view language) {
+  return *std::ranges::find(localizedTables(), language, &LocalizedTable::language);
+}
+
+std::set<std::string> keys(const LocalizedTable& table) {
+  std::set<std::string> keys;
+  for (const auto& entry : table.entries) {
+    keys.emplace(entry.key);
+  }
+  return keys;
+}
+
+std::string withEllipsis(std::string_view key) {
+  std::string text(key);
+  if (const auto place = text.find(escapedEllipsis); place != std::string::npos) {
+    text.replace(place, escapedEllipsis.size(), ellipsis);
+  }
+  return text;
+}
+
+TEST(TablesTest, areInFiveLanguages) {
+  std::vector<std::string_view> languages;
+  std::ranges::transform(localizedTables(), std::back_inserter(languages), &LocalizedTable::language);
+  EXPECT_THAT(languages, UnorderedElementsAre("en", "de", "fr", "es", "ja"));
+}
+
+TEST(TablesTest, haveTheSameKeys) {
+  for (const auto& each : localizedTables()) {
+    EXPECT_EQ(keys(each), keys(table("en"))) << each.language;
+  }
+}
+
+TEST(TablesTest, areSorted) {
+  for (const auto& each : localizedTables()) {
+    EXPECT_TRUE(std::ranges::is_sorted(each.entries, {}, &lumora::LocalizedEntry::key)) << each.language;
+  }
+}
+
+TEST(TablesTest, englishIsTheKeyItselfWithARealEllipsis) {
+  for (const auto& [key, text] : table("en").entries) {
+    EXPECT_EQ(text, withEllipsis(key));
+  }
+}
+
+TEST(TablesTest, textsEndWithAnEllipsis_whereTheirKeysDo) {
+  for (const auto& each : localizedTables()) {
+    for (const auto& [key, text] : each.entries) {
+      EXPECT_EQ(text.ends_with(ellipsis), key.ends_with(escapedEllipsis)) << each.language << ": " << key;
+      EXPECT_EQ(text.find(escapedEllipsis), std::string_view::npos) << each.language << ": " << key;
+    }
+  }
+}
+
+TEST(TablesTest, everyTextIsTranslated) {
+  for (const auto& each : localizedTables()) {
+    for (const auto& [key, text] : each.entries) {
+      EXPECT_TRUE(each.language == "en" || text != withEllipsis(key)) << each.language << ": " << key;
+    }
+  }
+}
+
+TEST(TablesTest, holdTheMessageOfEveryStatus) {
+  const lumora::fakes::FakePlatform platform;
+  const auto known = keys(table("en"));
+  for (int status = -1; status < 256; ++status) {
+    EXPECT_EQ(known.count(lumora::messageForStatusCode(status)), 1U) << status;
+  }
+}
+
+// The keys that stand as literals in the framework's sources.
+std::set<std::string> literalKeys() {
+  static const std::regex call(R"-(LMRLocalizedString\(\s*"((?:[^"\\]|\\.)*)"\s*\))-");
+  std::set<std::string> keys;
+  for (const auto& file : std::filesystem::recursive_directory_iterator(LUMORA_SOURCE_DIR "/LumoraKit")) {
+    if (file.path().extension() != ".cpp") {
+      continue;
+    }
+    std::ifstream stream(file.path());
+    const std::string source(std::istreambuf_iterator<char>(stream), {});
+    for (std::sregex_iterator match(source.begin(), source.end(), call), end; match != end; ++match) {
+      keys.insert(std::regex_replace((*match)[1].str(), std::regex(R"(\\(.))"), "$1"));
+    }
+  }
+  return keys;
+}
+
+TEST(TablesTest, holdEveryKeyOfTheSources) {
+  const auto known = keys(table("en"));
+  const auto used = literalKeys();
+  EXPECT_EQ(used.count("Connecting\\U2026"), 1U);
+  EXPECT_EQ(used.count("Generic podcast error"), 1U);
+  for (const auto& key : used) {
+    EXPECT_EQ(known.count(key), 1U) << key;
+  }
+}
+
+} // namespace
