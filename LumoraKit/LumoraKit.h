@@ -40,6 +40,7 @@
 #include <LumoraKit/platform/PropertyList.h>
 #include <LumoraKit/platform/Queues.h>
 #include <LumoraKit/platform/RootedToolRunner.h>
+#include <LumoraKit/platform/Secret.h>
 #include <LumoraKit/platform/Value.h>
 #include <LumoraKit/recording/LMRCaptureDeviceAdditions.h>
 #include <LumoraKit/recording/LMRCaptureDeviceInputAdditions.h>

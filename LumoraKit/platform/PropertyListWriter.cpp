@@ -14,6 +14,8 @@ namespace {
 class Writer {
 public:
   template <class Root> std::optional<std::string> write(const Root& root, LMRErrorRef* error) {
+    // Enough for a tool's request: one that holds a password leaves no copy behind by growing.
+    text_.reserve(4096);
     text_ = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<plist version=\"1.0\">\n";
     ValueWalk(*this).through(root);
     text_ += "</plist>\n";

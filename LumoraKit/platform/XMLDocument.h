@@ -21,6 +21,6 @@ struct XMLElement {
 
 /// The document with that root: an XML declaration without an encoding, UTF-8, one element a line, indented. Nothing
 /// when an attribute's value holds what XML cannot carry (a control character, invalid UTF-8). Any thread.
-LUMORA_EXPORT std::optional<std::string> xmlDocument(const XMLElement& root);
+LUMORA_INTERNAL std::optional<std::string> xmlDocument(const XMLElement& root);
 
 } // namespace lumora

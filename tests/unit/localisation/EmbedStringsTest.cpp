@@ -1,3 +1,5 @@
+#include "support/TemporaryFolder.h"
+
 #include <LumoraKit/platform/KTRunTask.h>
 
 #include <gmock/gmock.h>
@@ -5,8 +7,6 @@
 
 #include <cstdlib>
 #include <filesystem>
-#include <fstream>
-#include <iterator>
 #include <string>
 
 using testing::HasSubstr;
@@ -16,33 +16,24 @@ namespace {
 /// Runs the build's own compiler of strings tables on a table.
 class EmbedStringsTest : public testing::Test {
 protected:
-  EmbedStringsTest() {
-    std::string name = testing::TempDir() + "embed-strings-XXXXXX";
-    folder_ = ::mkdtemp(name.data());
-    std::filesystem::create_directory(folder_ / "xx.lproj");
-  }
-  ~EmbedStringsTest() override { std::filesystem::remove_all(folder_); }
+  EmbedStringsTest() { std::filesystem::create_directory(folder_ / "xx.lproj"); }
 
   /// The exit status; the messages are in errors_.
   int compile(const std::string& table) {
     const auto path = folder_ / "xx.lproj" / "Localizable.strings";
-    std::ofstream(path, std::ios::binary) << table;
+    lumora::tests::writeFile(path, table);
     return KTRunTask(LUMORA_EMBED_STRINGS, {output(), path.string()}, "", nullptr, &errors_, nullptr);
   }
 
   std::string output() const { return (folder_ / "Tables.cpp").string(); }
-
-  std::string source() const {
-    std::ifstream stream(output());
-    return {std::istreambuf_iterator<char>(stream), {}};
-  }
+  std::string source() const { return lumora::tests::contentOf(output()); }
 
   void expectRefused(const std::string& table, const std::string& reason) {
     EXPECT_EQ(compile(table), EXIT_FAILURE) << table;
     EXPECT_THAT(errors_, HasSubstr("Localizable.strings:" + reason));
   }
 
-  std::filesystem::path folder_;
+  lumora::tests::TemporaryFolder folder_;
   std::string errors_;
 };
 
