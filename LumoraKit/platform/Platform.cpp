@@ -17,10 +17,10 @@ Platform makeMachinePlatform() {
   platform.files = backend::makeFiles();
   platform.log = backend::makeSystemLog();
   platform.mainThread = backend::makeMainThread();
-  platform.mediaCapture = backend::makeMediaCapture();
   platform.notificationCenter = std::make_shared<NotificationCenter>();
   platform.preferences = backend::makePreferences();
   platform.queues = backend::makeQueues(platform.mainThread);
+  platform.mediaCapture = backend::makeMediaCapture(platform.queues);
   platform.toolRunner = backend::makeToolRunner();
   platform.wallClock = backend::makeWallClock();
   return platform;

@@ -29,8 +29,8 @@ std::shared_ptr<Files> makeFiles();
 std::shared_ptr<Log> makeSystemLog();
 /// GLib's default main context.
 LUMORA_INTERNAL std::shared_ptr<MainThread> makeMainThread();
-/// GStreamer; initialised when first asked for a device.
-std::shared_ptr<MediaCapture> makeMediaCapture();
+/// GStreamer; initialised when first asked for a device or an output.
+LUMORA_INTERNAL std::shared_ptr<MediaCapture> makeMediaCapture(std::shared_ptr<Queues> queues);
 /// One property-list file a domain below the XDG configuration folder.
 std::shared_ptr<Preferences> makePreferences();
 /// An elastic pool of threads.

@@ -1,0 +1,18 @@
+#pragma once
+
+#include <LumoraKit/platform/linux/gstreamer/GstPtr.h>
+
+#include <string>
+
+namespace lumora::backend {
+
+/// What a device's pipeline begins with.
+struct CaptureSource {
+  GstPtr<GstElement> element;
+  /// What is asked of it.
+  GstPtr<GstCaps> caps;
+  /// For sound: the name by which the sound server knows the device; empty when it cannot be moved to another one.
+  std::string soundDevice;
+};
+
+} // namespace lumora::backend
