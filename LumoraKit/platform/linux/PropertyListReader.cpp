@@ -50,6 +50,8 @@ Reader::Reader(bool dictionaryOnly) : parser_(XML_ParserCreate(nullptr)), builde
   XML_SetCharacterDataHandler(parser_.get(), &onText);
   XML_SetEntityDeclHandler(parser_.get(), &onEntityDeclaration);
   XML_SetSkippedEntityHandler(parser_.get(), &onSkippedEntity);
+  // Else a parameter entity would be passed over silently, with every declaration behind it.
+  XML_SetParamEntityParsing(parser_.get(), XML_PARAM_ENTITY_PARSING_ALWAYS);
 }
 
 std::optional<Value> Reader::read(std::string_view text, LMRErrorRef* error) {
