@@ -1,5 +1,5 @@
 #include <LumoraKit/platform/Log.h>
-#include <LumoraKit/platform/Platform.h>
+#include <LumoraKit/testing/FakePlatform.h>
 
 #include <cerrno>
 
@@ -74,21 +74,10 @@ TEST(LMRError, namesTheReason_whenMadeFromErrno) {
   EXPECT_EQ(error->localizedDescription(), "open: No such file or directory");
 }
 
-class RecordingLog final : public Log {
-public:
-  void write(std::string_view line) override { lines.emplace_back(line); }
-  std::vector<std::string> lines;
-};
-
 TEST(Log, receivesTheFilledLine_whenSomethingIsLogged) {
-  const Platform before = Platform::current();
-  const auto recording = std::make_shared<RecordingLog>();
-  Platform platform = before;
-  platform.log = recording;
-  Platform::install(platform);
+  const fakes::FakePlatform platform;
   log("Error %d for %@", {text(26), text("submit")});
-  Platform::install(before);
-  EXPECT_THAT(recording->lines, testing::ElementsAre("Error 26 for submit"));
+  EXPECT_THAT(platform.log->lines(), testing::ElementsAre("Error 26 for submit"));
 }
 
 } // namespace
