@@ -75,9 +75,10 @@ TEST(LMRError, namesTheReason_whenMadeFromErrno) {
 }
 
 TEST(Log, receivesTheFilledLine_whenSomethingIsLogged) {
-  const fakes::FakePlatform platform;
+  // Stays installed: nothing else in this program logs.
+  static const auto* const platform = new fakes::FakePlatform;
   log("Error %d for %@", {text(26), text("submit")});
-  EXPECT_THAT(platform.log->lines(), testing::ElementsAre("Error 26 for submit"));
+  EXPECT_THAT(platform->log->lines(), testing::ElementsAre("Error 26 for submit"));
 }
 
 } // namespace
