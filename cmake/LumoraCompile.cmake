@@ -16,7 +16,8 @@ endif()
 add_library(lumora-compile INTERFACE)
 target_compile_options(
   lumora-compile
-  INTERFACE -Wall
+  INTERFACE -pthread # for all, as GLib's own flags have it: precompiled headers are shared only between like options
+            -Wall
             -Wextra
             -Wpedantic
             $<IF:$<CXX_COMPILER_ID:GNU>,-Wshadow=local,-Wshadow>
