@@ -79,6 +79,9 @@ void installTools(const fs::path& root, const fs::path& program) {
   for (const auto& place : places) {
     const fs::path tool = root / place.path;
     fs::create_directories(tool.parent_path());
+    if (fs::is_symlink(tool)) {
+      fs::remove(tool);
+    }
     fs::create_symlink(program, tool);
   }
 }

@@ -21,7 +21,7 @@ struct Invocation {
   static Invocation current();
 };
 
-/// Puts the tools into a root, as links to the program.
+/// Puts the tools into a root, as links to the program. Links that are there are replaced, files are not.
 void installTools(const std::filesystem::path& root, const std::filesystem::path& program);
 
 } // namespace lumora::sandbox

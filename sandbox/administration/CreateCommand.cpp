@@ -38,6 +38,8 @@ void set(Store& store, const Options& options) {
 void create(const Options& options) {
   // Before anything is made, so that a missing password leaves nothing behind.
   const std::string password = options.user.empty() ? "" : readPassword(options.passwordFile);
+  // First, because tools without a state do no harm, but a state without tools would pass for a server.
+  installTools(options.root, std::filesystem::read_symlink("/proc/self/exe"));
   Store store = Store::create(options.root);
   store.change([&] {
     set(store, options);
@@ -46,7 +48,6 @@ void create(const Options& options) {
       addFirstUser(store, options, password);
     }
   });
-  installTools(store.root(), std::filesystem::read_symlink("/proc/self/exe"));
   std::cout << "Created a server at " << store.root().string() << ", port " << options.port << ".\n";
 }
 

@@ -1,8 +1,10 @@
+#include "../commands/Command.h"
 #include "../store/Faults.h"
 #include "Commands.h"
 
 #include <iostream>
 #include <memory>
+#include <set>
 
 namespace lumora::sandbox {
 
@@ -43,11 +45,23 @@ void clear(const Options& options) {
   clearFaults(store);
 }
 
+/// A fault for a mistyped command would never strike.
+std::set<std::string> commandNames() {
+  std::set<std::string> names{"*"};
+  for (const auto tool : {ToolKind::Main, ToolKind::Action}) {
+    for (const auto& command : commandsOf(tool)) {
+      names.emplace(command.word);
+    }
+  }
+  return names;
+}
+
 CLI::App& addKind(CLI::App& group, const std::string& name, const std::string& text,
                   const std::shared_ptr<Options>& options) {
   auto& command = *group.add_subcommand(name, text);
   addRootArgument(command, options->root);
-  command.add_option("--command", options->command, "command word it strikes; * is every command")
+  command.add_option("--command", options->command, "command that it strikes; * is every command")
+      ->check(CLI::IsMember(commandNames()).description(""))
       ->capture_default_str();
   command.add_option("--times", options->times, "how many runs it strikes; without it every one")
       ->check(CLI::PositiveNumber);

@@ -10,10 +10,6 @@ std::optional<std::string> textOf(const std::optional<Dictionary>& dictionary) {
   return dictionary ? std::optional(xmlDescription(*dictionary).value()) : std::nullopt;
 }
 
-std::optional<std::string> optionalText(const SQLite::Column& column) {
-  return column.isNull() ? std::nullopt : std::optional(column.getString());
-}
-
 Episode episodeFrom(SQLite::Statement& row) {
   Episode episode;
   episode.uuid = row.getColumn(0).getString();

@@ -17,19 +17,8 @@ Fault::Kind kindNamed(const std::string& name) {
 }
 
 Fault faultFrom(SQLite::Statement& row) {
-  Fault fault{row.getColumn(0).getInt64(),
-              row.getColumn(1).getString(),
-              kindNamed(row.getColumn(2).getString()),
-              row.getColumn(3).getInt64(),
-              std::nullopt,
-              std::nullopt};
-  if (const auto message = row.getColumn(4); !message.isNull()) {
-    fault.message = message.getString();
-  }
-  if (const auto remaining = row.getColumn(5); !remaining.isNull()) {
-    fault.remaining = remaining.getInt64();
-  }
-  return fault;
+  return {row.getColumn(0).getInt64(), row.getColumn(1).getString(),   kindNamed(row.getColumn(2).getString()),
+          row.getColumn(3).getInt64(), optionalText(row.getColumn(4)), optionalNumber(row.getColumn(5))};
 }
 
 std::vector<Fault> faultsFrom(SQLite::Statement row) {
@@ -53,12 +42,8 @@ std::string_view nameOf(Fault::Kind kind) {
 }
 
 void addFault(Store& store, const Fault& fault) {
-  auto statement = store.query("INSERT INTO faults (command, kind, value, message, remaining) VALUES (?, ?, ?, ?, ?)",
-                               fault.command, std::string(nameOf(fault.kind)), fault.value, fault.message);
-  if (fault.remaining) {
-    statement.bind(5, *fault.remaining);
-  }
-  statement.exec();
+  store.execute("INSERT INTO faults (command, kind, value, message, remaining) VALUES (?, ?, ?, ?, ?)", fault.command,
+                std::string(nameOf(fault.kind)), fault.value, fault.message, fault.remaining);
 }
 
 void clearFaults(Store& store) {

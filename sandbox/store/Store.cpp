@@ -125,12 +125,12 @@ void Store::setSetting(const std::string& key, const std::string& value) {
   execute("INSERT INTO settings VALUES (?, ?) ON CONFLICT (key) DO UPDATE SET value = excluded.value", key, value);
 }
 
-void Store::bindOne(SQLite::Statement& statement, int index, const std::optional<std::string>& text) {
-  if (text) {
-    statement.bind(index, *text);
-  } else {
-    statement.bind(index);
-  }
+std::optional<std::string> optionalText(const SQLite::Column& column) {
+  return column.isNull() ? std::nullopt : std::optional(column.getString());
+}
+
+std::optional<std::int64_t> optionalNumber(const SQLite::Column& column) {
+  return column.isNull() ? std::nullopt : std::optional<std::int64_t>(column.getInt64());
 }
 
 std::int64_t currentTime() {

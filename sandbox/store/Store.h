@@ -62,11 +62,21 @@ private:
   }
   static void bindOne(SQLite::Statement& statement, int index, const std::string& text) { statement.bind(index, text); }
   static void bindOne(SQLite::Statement& statement, int index, std::int64_t number) { statement.bind(index, number); }
-  static void bindOne(SQLite::Statement& statement, int index, const std::optional<std::string>& text);
+  template <class Content>
+  static void bindOne(SQLite::Statement& statement, int index, const std::optional<Content>& content) {
+    // What is not bound is NULL.
+    if (content) {
+      statement.bind(index, *content);
+    }
+  }
 
   std::filesystem::path root_;
   std::unique_ptr<SQLite::Database> database_;
 };
+
+/// The column's content; nothing for NULL.
+std::optional<std::string> optionalText(const SQLite::Column& column);
+std::optional<std::int64_t> optionalNumber(const SQLite::Column& column);
 
 /// Seconds since 1970, as the state keeps moments.
 std::int64_t currentTime();

@@ -5,18 +5,10 @@ namespace lumora::sandbox {
 namespace {
 
 Upload uploadFrom(SQLite::Statement& row) {
-  Upload upload{row.getColumn(0).getString(), row.getColumn(1).getString(),
-                row.getColumn(2).getString(), row.getColumn(3).getString(),
-                row.getColumn(4).getInt64(),  row.getColumn(5).getInt64(),
-                row.getColumn(6).getString(), std::nullopt,
-                row.getColumn(8).getInt64(),  std::nullopt};
-  if (const auto message = row.getColumn(7); !message.isNull()) {
-    upload.message = message.getString();
-  }
-  if (const auto ended = row.getColumn(9); !ended.isNull()) {
-    upload.ended = ended.getInt64();
-  }
-  return upload;
+  return {row.getColumn(0).getString(),    row.getColumn(1).getString(),   row.getColumn(2).getString(),
+          row.getColumn(3).getString(),    row.getColumn(4).getInt64(),    row.getColumn(5).getInt64(),
+          row.getColumn(6).getString(),    optionalText(row.getColumn(7)), row.getColumn(8).getInt64(),
+          optionalNumber(row.getColumn(9))};
 }
 
 } // namespace

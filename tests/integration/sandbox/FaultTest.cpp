@@ -74,3 +74,9 @@ TEST(Fault, isRefused_whenTheStatusIsNone) {
     EXPECT_EQ(server.administrate({"inject", "failure"}, {"--status", status}).status, 2) << status;
   }
 }
+
+TEST(Fault, isRefused_whenThereIsNoSuchCommand) {
+  const SandboxServer server;
+  EXPECT_THAT(server.administrate({"inject", "hang"}, {"--command", "sumbit"}), EndedWith(2, "sumbit"));
+  EXPECT_THAT(server.administrate({"inject", "hang"}, {"--command", "start"}), Succeeded());
+}
