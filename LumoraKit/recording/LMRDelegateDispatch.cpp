@@ -58,10 +58,10 @@ void LMRSourceRecorder::notifyDelegate(std::string_view selector, const LMRError
   });
 }
 
-void LMRSourceRecorder::dispatchDelegateMethodWithArguments(const LMRDelegateArguments& arguments) {
+void LMRSourceRecorder::dispatchDelegateMethodWithArguments(const LMRDelegateArguments& arguments) const {
   const auto selector = argument<std::string>(arguments, LMRDelegateSelector);
-  const auto message = std::find_if(std::begin(messages), std::end(messages),
-                                    [&](const Message& candidate) { return candidate.selector == selector; });
+  const auto* const message = std::find_if(std::begin(messages), std::end(messages),
+                                           [&](const Message& candidate) { return candidate.selector == selector; });
   const auto receiver = delegate();
   if (message == std::end(messages) || !receiver) {
     return;

@@ -94,7 +94,7 @@ void LMRLocalVideoRecorder::bootstrap() {
   setOutputFileURL(*folder / (lumora::makeUUIDString() + ".mov"));
 }
 
-void LMRLocalVideoRecorder::setCompressionOptionsOfConnections() {
+void LMRLocalVideoRecorder::setCompressionOptionsOfConnections() const {
   const auto output = movieFileOutput();
   for (const auto& connection : output->connections()) {
     const auto options =
@@ -134,7 +134,7 @@ void LMRLocalVideoRecorder::cancel() {
 }
 
 // False when no file is being written.
-bool LMRLocalVideoRecorder::finishFile() {
+bool LMRLocalVideoRecorder::finishFile() const {
   const auto output = movieFileOutput();
   if (!output->outputFileURL()) {
     return false;

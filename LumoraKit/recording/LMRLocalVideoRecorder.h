@@ -158,8 +158,8 @@ private:
     std::atomic<lumora::HostTime> time_ = none;
   };
 
-  void setCompressionOptionsOfConnections();
-  bool finishFile();
+  void setCompressionOptionsOfConnections() const;
+  bool finishFile() const;
   void actOnSample(const lumora::SampleBuffer& sampleBuffer);
   void reportFinish(const std::filesystem::path& file, const LMRErrorRef& error);
 

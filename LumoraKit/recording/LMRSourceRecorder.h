@@ -112,7 +112,7 @@ public:
   void updateElapsedRecordingTime();
 
   /// Sends a message to the delegate that the recorder has now. Main thread only.
-  void dispatchDelegateMethodWithArguments(const LMRDelegateArguments& arguments);
+  void dispatchDelegateMethodWithArguments(const LMRDelegateArguments& arguments) const;
 
 private:
   struct Clock {

@@ -63,7 +63,7 @@ template <class Delegate> constexpr bool delegateImplements(std::string_view sel
   using Base = LMRSourceRecorderDelegate;
   struct Message {
     std::string_view selector;
-    bool isImplemented;
+    bool isSent = false;
   };
   constexpr Message messages[] = {
       {LMRDelegateMessage::recorderDidStartRecording,
@@ -94,7 +94,7 @@ template <class Delegate> constexpr bool delegateImplements(std::string_view sel
   };
   for (const Message& message : messages) {
     if (message.selector == selector) {
-      return message.isImplemented;
+      return message.isSent;
     }
   }
   return false;

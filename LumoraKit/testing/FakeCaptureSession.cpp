@@ -29,8 +29,8 @@ LMRErrorRef FakeCaptureSession::addInput(const std::shared_ptr<CaptureInput>& in
   if (auto error = device ? refusal(*device) : screenError_) {
     return error;
   }
-  if (contains(inputs_, input)) {
-    return captureError(CaptureErrorCode::NotPossible, "The input was added before");
+  if (isRunning_ || contains(inputs_, input)) {
+    return captureError(CaptureErrorCode::NotPossible, "The session runs, or has the input already");
   }
   inputs_.push_back(input);
   return nullptr;

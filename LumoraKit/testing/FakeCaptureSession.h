@@ -9,8 +9,8 @@
 
 namespace lumora::fakes {
 
-/// A session of the fake capture system; made by FakeMediaCapture::makeSession. It takes inputs of opened devices and
-/// fake outputs, each once. Any thread.
+/// A session of the fake capture system; made by FakeMediaCapture::makeSession. It takes inputs of opened devices
+/// while it does not run, and fake outputs at any time, each once. Any thread.
 class LUMORA_EXPORT FakeCaptureSession : public CaptureSession,
                                          public std::enable_shared_from_this<FakeCaptureSession> {
 public:

@@ -225,6 +225,7 @@ bool FakeMovieFileOutput::attachTo(std::weak_ptr<FakeCaptureSession> session) {
 
 void FakeMovieFileOutput::detach() {
   const std::lock_guard lock(mutex_);
+  finish(nullptr);
   session_.reset();
 }
 

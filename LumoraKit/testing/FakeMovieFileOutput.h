@@ -75,7 +75,7 @@ public:
   std::vector<std::string> requests() const;
   std::optional<CompressionOptions> compressionOptions(const CaptureConnection& connection) const;
 
-  /// For the session. False when the output is in one already.
+  /// For the session. False when the output is in one already. An output that leaves its session finishes its file.
   bool attachTo(std::weak_ptr<FakeCaptureSession> session);
   void detach();
 
