@@ -41,7 +41,6 @@ public:
 private:
   FileDescriptor descriptor_;
   std::string& text_;
-  bool enlarged_ = false;
 };
 
 /// Feeds a running child and collects its outputs, all at once, until the child has ended and its outputs are closed.
