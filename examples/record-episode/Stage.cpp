@@ -6,6 +6,7 @@
 #include <csignal>
 #include <cstdlib>
 #include <iostream>
+#include <map>
 #include <sstream>
 
 #include <unistd.h>
@@ -20,6 +21,20 @@ void show(const std::string& line) {
   if (isatty(STDERR_FILENO) != 0) {
     std::cerr << "\r\033[K" << line << std::flush;
   }
+}
+
+// One track as ffprobe tells it ("codec_name=h264|width=1280|...") in words.
+std::string described(const std::string& track) {
+  std::map<std::string, std::string> fact;
+  std::istringstream facts(track);
+  for (std::string pair; std::getline(facts, pair, '|');) {
+    const auto equals = pair.find('=');
+    fact[pair.substr(0, equals)] = equals == std::string::npos ? "" : pair.substr(equals + 1);
+  }
+  const std::string format = fact["codec_type"] == "video"
+                                 ? fact["width"] + "x" + fact["height"] + ", " + fact["nb_read_packets"] + " frames"
+                                 : fact["sample_rate"] + " Hz, " + fact["channels"] + " channels";
+  return fact["codec_type"] + ": " + fact["codec_name"] + ", " + format + ", " + fact["duration"] + " s";
 }
 
 } // namespace
@@ -64,13 +79,13 @@ std::vector<std::filesystem::path> Server::storedMovies() const {
 }
 
 std::vector<std::string> Server::mediaFacts(const std::filesystem::path& movie) const {
-  std::istringstream facts(run("/usr/bin/ffprobe", {"-v", "error", "-count_packets", "-show_entries",
-                                                    "stream=codec_type,codec_name,width,height,sample_rate,channels,"
-                                                    "nb_read_packets,duration",
-                                                    "-of", "compact=print_section=0:item_sep=\\ \\ ", movie}));
+  std::istringstream tracks(run("/usr/bin/ffprobe", {"-v", "error", "-count_packets", "-show_entries",
+                                                     "stream=codec_type,codec_name,width,height,sample_rate,channels,"
+                                                     "nb_read_packets,duration",
+                                                     "-of", "compact=print_section=0", movie}));
   std::vector<std::string> lines;
-  for (std::string line; std::getline(facts, line);) {
-    lines.push_back(line);
+  for (std::string track; std::getline(tracks, track);) {
+    lines.push_back(described(track));
   }
   return lines;
 }

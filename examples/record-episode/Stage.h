@@ -47,7 +47,7 @@ public:
   std::string episodes() const;
   /// The movie files that it stores.
   std::vector<std::filesystem::path> storedMovies() const;
-  /// What a movie file holds, read back from the file: a line a track with codec, size, packets and duration.
+  /// What a movie file holds, read back from the file: a line a track with codec, format and duration.
   std::vector<std::string> mediaFacts(const std::filesystem::path& movie) const;
 
 private:
