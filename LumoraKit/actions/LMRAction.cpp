@@ -77,7 +77,7 @@ void LMRAction::startExecution() {
   const auto tool = this->tool();
   const auto session = this->session();
   lumora::assertThat(tool.has_value(), "self.tool != nil", __func__, "LMRAction");
-  lumora::assertThat(!authorizationRef(), "self.authorizationRef == nil", __func__, "LMRAction");
+  lumora::assertThat(authorizationRef() == nullptr, "self.authorizationRef == nil", __func__, "LMRAction");
   lumora::assertThat(!session || session->authenticationType() != LMRAuthenticationTypeUnknown,
                      "self.session.authenticationType != LMRAuthenticationTypeUnknown", __func__, "LMRAction");
   const lumora::Request request{*tool, command(), arguments(), session};

@@ -3,6 +3,8 @@
 #include <LumoraKit/platform/Log.h>
 #include <LumoraKit/platform/PropertyList.h>
 
+#include <algorithm>
+#include <cstdint>
 #include <utility>
 
 namespace lumora {
@@ -23,15 +25,15 @@ void appendCredentials(Array& request, const LMRSession& session, bool withAuthe
   }
 }
 
-Array elements(const Request& request) {
-  const bool wordy = takesCommandWord(request.tool);
+Array elementsOf(const Request& request) {
+  const bool isServerTool = takesCommandWord(request.tool);
   Array elements;
   if (request.session) {
     elements.push_back(requestPair("server", hostAndPort(request.session->server(), request.session->port())));
-    appendCredentials(elements, *request.session, wordy);
+    appendCredentials(elements, *request.session, isServerTool);
   }
   if (request.command) {
-    elements.push_back(wordy ? Value(*request.command) : requestPair("subcommand", *request.command));
+    elements.push_back(isServerTool ? Value(*request.command) : requestPair("subcommand", *request.command));
   }
   if (request.arguments) {
     elements.insert(elements.end(), request.arguments->begin(), request.arguments->end());
@@ -51,13 +53,19 @@ void wipeValues(Array& elements) {
   }
 }
 
+bool canBeWritten(const Value& element) {
+  std::optional<std::string> text = xmlDescription(element);
+  if (text) {
+    wipe(*text);
+  }
+  return text.has_value();
+}
+
 // Names the element at fault and nothing of its content, which may be a password.
 std::string refusalReason(const Array& elements) {
-  std::size_t position = 0;
-  while (position < elements.size() && xmlDescription(elements[position])) {
-    ++position;
-  }
-  return format("Element %u of the request cannot be written as a property list", {text(position + 1)});
+  const auto fault = std::ranges::find_if_not(elements, canBeWritten);
+  const auto position = static_cast<std::uint64_t>(fault - elements.begin() + 1);
+  return format("Element %u of the request cannot be written as a property list", {text(position)});
 }
 
 } // namespace
@@ -77,7 +85,7 @@ std::string hostAndPort(const std::optional<std::string>& host, std::uint16_t po
 }
 
 std::optional<Secret> Request::serialised(std::string& reason) const {
-  Array request = elements(*this);
+  Array request = elementsOf(*this);
   std::optional<std::string> text = xmlDescription(request);
   if (!text) {
     reason = refusalReason(request);

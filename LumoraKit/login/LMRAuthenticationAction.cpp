@@ -99,6 +99,7 @@ void LMRAuthenticationAction::stopExecution() {
   }
 }
 
+// NOLINTNEXTLINE(readability-make-member-function-const): a selector is not const
 void LMRAuthenticationAction::listedInfoWithAction(const std::shared_ptr<LMRAction>& action) {
   if (const auto session = this->session()) {
     session->setVersion(textInReply(*action, "server_version"));
@@ -109,6 +110,7 @@ void LMRAuthenticationAction::failedToListInfoWithAction(const std::shared_ptr<L
   setError(action->error());
 }
 
+// NOLINTNEXTLINE(readability-make-member-function-const): a selector is not const
 void LMRAuthenticationAction::listedWorkflowsWithAction(const std::shared_ptr<LMRAction>& action) {
   const auto session = this->session();
   if (!session) {

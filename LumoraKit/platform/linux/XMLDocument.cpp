@@ -35,7 +35,7 @@ std::optional<std::string> xmlDocument(const XMLElement& root) {
     return std::nullopt;
   }
   pugi::xml_document document;
-  append(document, root);
+  append(document.root(), root);
   std::ostringstream text;
   document.save(text, "  ", pugi::format_indent, pugi::encoding_utf8);
   return std::move(text).str();
