@@ -7,7 +7,9 @@
 #include <benchmark/benchmark.h>
 
 #include <cstdlib>
-#include <memory>
+#include <string>
+#include <utility>
+#include <vector>
 
 namespace lumora::bench {
 namespace {

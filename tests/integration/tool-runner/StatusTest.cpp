@@ -12,8 +12,6 @@ namespace lumora::tests {
 namespace {
 
 using testing::EndsWith;
-using testing::HasSubstr;
-using testing::StartsWith;
 
 // Lets no more descriptors be opened than those that are.
 class NoMoreDescriptors {

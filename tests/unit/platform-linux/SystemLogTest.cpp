@@ -5,8 +5,7 @@
 
 #include <gmock/gmock.h>
 
-#include <array>
-#include <cstring>
+#include <memory>
 #include <optional>
 #include <string>
 #include <vector>
@@ -21,7 +20,6 @@ namespace {
 using backend::FileDescriptor;
 using backend::SystemLog;
 using testing::EndsWith;
-using testing::HasSubstr;
 using testing::MatchesRegex;
 
 // A log daemon: it gets datagrams and reads them when it is asked to.

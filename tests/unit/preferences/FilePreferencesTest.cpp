@@ -17,8 +17,6 @@ namespace lumora::tests {
 namespace {
 
 using backend::FilePreferences;
-using testing::ElementsAre;
-using testing::StartsWith;
 
 const std::string domain = "org.vantor.lumora.test";
 
