@@ -99,7 +99,7 @@ int FakeFiles::createParents(const std::filesystem::path& path) {
   for (const auto& part : path) {
     current /= part;
     if (files_.count(current) > 0) {
-      return current == path ? EEXIST : ENOTDIR;
+      return EEXIST;
     }
     directories_.insert(current);
   }
