@@ -1,4 +1,5 @@
 #include <LumoraKit/actions/LMRApplicationSupportDirectory.h>
+#include <LumoraKit/login/LMRPreferenceKeys.h>
 #include <LumoraKit/platform/Application.h>
 #include <LumoraKit/platform/Assert.h>
 #include <LumoraKit/platform/Files.h>
@@ -23,7 +24,7 @@ lumora::HostTime hostTime() {
 
 std::optional<std::filesystem::path> destinationFolder() {
   const auto& platform = lumora::Platform::current();
-  const auto chosen = platform.preferences->value(platform.application->identifier(), LMRRecorderDestinationFolderKey);
+  const auto chosen = platform.preferences->value(platform.application->identifier(), LMRRecorderDestinationFolder);
   if (const std::string* folder = chosen ? chosen->string() : nullptr) {
     return *folder;
   }

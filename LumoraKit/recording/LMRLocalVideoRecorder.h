@@ -7,9 +7,6 @@
 #include <filesystem>
 #include <limits>
 
-/// Key of the application's preferences for the folder of recordings, in place of the application-support folder.
-inline constexpr std::string_view LMRRecorderDestinationFolderKey = "RecorderDestinationFolder";
-
 /// Records a capture session into a movie file.
 ///
 ///     LMRErrorRef error;
@@ -87,8 +84,8 @@ public:
   std::optional<lumora::HostTime> hostTimeToResume() const { return hostTimeToResume_.get(); }
 
   /// Adds the output to the session and chooses the file: a new UUID with ".mov" in the application-support folder,
-  /// or in the folder that the application's preferences name. Needs a session (asserted). Nothing is written yet. An
-  /// output that cannot be added fails the start. Any thread.
+  /// or in the folder that the application's preferences name under LMRRecorderDestinationFolder. Needs a session
+  /// (asserted). Nothing is written yet. An output that cannot be added fails the start. Any thread.
   void bootstrap() override;
   /// Starts the file at the first sample that is captured after now. The delay is ignored. Any thread.
   void startWithDelay(double delay) override;

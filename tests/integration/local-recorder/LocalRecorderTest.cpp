@@ -4,6 +4,7 @@
 #include "support/RecordingDelegate.h"
 #include "support/TemporaryFolder.h"
 
+#include <LumoraKit/login/LMRPreferenceKeys.h>
 #include <LumoraKit/platform/Application.h>
 #include <LumoraKit/platform/Log.h>
 #include <LumoraKit/recording/LMRCaptureDeviceAdditions.h>
@@ -34,7 +35,7 @@ protected:
     }
     auto platform = previous_;
     const auto preferences = std::make_shared<lumora::fakes::FakePreferences>();
-    preferences->setValue(platform.application->identifier(), LMRRecorderDestinationFolderKey, folder_.path().string());
+    preferences->setValue(platform.application->identifier(), LMRRecorderDestinationFolder, folder_.path().string());
     platform.preferences = preferences;
     lumora::Platform::install(platform);
     LMRErrorRef error;
