@@ -61,6 +61,15 @@ public:
 
   void setNow(Time now) { now_ = now; }
 
+  // Drops what was never run: tasks hold their queues, and queues hold this.
+  void clear() {
+    std::deque<Item> ready;
+    std::multimap<Time, Item> delayed;
+    const std::lock_guard lock(mutex_);
+    ready_.swap(ready);
+    delayed_.swap(delayed);
+  }
+
   // The moment that lies so far ahead, or the last there is.
   Time after(Time delay) const {
     const Time now = now_;
@@ -140,7 +149,9 @@ ManualQueues::ManualQueues()
       highPriorityQueue_(std::make_shared<Queue>("concurrent, high priority", true, schedule_)),
       mainThread_(std::make_shared<MainThreadOfSchedule>(schedule_, mainQueue_)) {}
 
-ManualQueues::~ManualQueues() = default;
+ManualQueues::~ManualQueues() {
+  schedule_->clear();
+}
 
 std::shared_ptr<MainThread> ManualQueues::mainThread() const {
   return mainThread_;

@@ -105,6 +105,17 @@ TEST_F(ManualQueues, takesTasksOfOtherThreads_whenTheyQueueThem) {
   EXPECT_THAT(ran_, ElementsAre(1));
 }
 
+TEST(ManualQueuesLifetime, dropsWhatWasNeverRun_whenTheObjectDies) {
+  const auto life = std::make_shared<int>(0);
+  {
+    lumora::fakes::ManualQueues queues;
+    queues.makeSerialQueue("serial")->async([life] {});
+    queues.runAfter(1s, queues.mainQueue(), [life] {});
+    EXPECT_EQ(life.use_count(), 3);
+  }
+  EXPECT_EQ(life.use_count(), 1);
+}
+
 TEST_F(ManualQueuesDeathTest, stopsTheProcess_whenADelayedTaskHasNoQueue) {
   EXPECT_DEATH(queues_.runAfter(1s, nullptr, noting(1)), "queue != nil, in runAfter of ManualQueues");
 }
