@@ -1,7 +1,10 @@
 #include "CaptureRig.h"
 
+#include "Movie.h"
+
 #include <LumoraKit/platform/Platform.h>
 
+#include <algorithm>
 #include <cstdlib>
 #include <thread>
 
@@ -23,15 +26,15 @@ HostTime NotingDelegate::atNext(MediaType type, Action action) {
   return actedAt_;
 }
 
-bool NotingDelegate::waitFor(const std::string& event, std::size_t count) {
+bool NotingDelegate::waitFor(const std::string& event, const std::filesystem::path& file) {
   std::unique_lock lock(mutex_);
   return changed_.wait_for(lock, patienceForEvents, [&] {
-    std::size_t seen = 0;
-    for (const Told& told : told_) {
-      seen += told.event == event ? 1U : 0U;
-    }
-    return seen >= count;
+    return std::ranges::any_of(told_, [&](const Told& told) { return told.event == event && told.file == file; });
   });
+}
+
+bool NotingDelegate::waitForEnd(const std::filesystem::path& file) {
+  return waitFor("did-finish", file);
 }
 
 std::vector<Told> NotingDelegate::told() const {
@@ -54,9 +57,9 @@ LMRErrorRef NotingDelegate::lastError() const {
   return told_.empty() ? nullptr : told_.back().error;
 }
 
-std::size_t NotingDelegate::samples(MediaType type) const {
+std::vector<HostTime> NotingDelegate::pictures() const {
   const std::lock_guard lock(mutex_);
-  return type == MediaType::Video ? pictures_ : sounds_;
+  return pictures_;
 }
 
 void NotingDelegate::note(const std::string& event, const std::filesystem::path& file, const LMRErrorRef& error) {
@@ -101,7 +104,9 @@ void NotingDelegate::captureOutput_didOutputSampleBuffer_fromConnection(MovieFil
   Action action;
   {
     const std::lock_guard lock(mutex_);
-    ++(connection.mediaType() == MediaType::Video ? pictures_ : sounds_);
+    if (connection.mediaType() == MediaType::Video) {
+      pictures_.push_back(sampleBuffer.hostTime().value_or(0));
+    }
     if (connection.mediaType() == wanted_) {
       std::swap(action, action_);
     }
@@ -158,21 +163,42 @@ void CaptureRig::run() {
 }
 
 HostTime CaptureRig::startAtNextPicture(const std::filesystem::path& file) {
-  return delegate_->atNext(MediaType::Video, [&](MovieFileOutput& output) { output.recordToOutputFileURL(file); });
+  return delegate_->atNext(MediaType::Video, [file](MovieFileOutput& output) { output.recordToOutputFileURL(file); });
 }
 
-void CaptureRig::stopAtNextPicture() {
-  delegate_->atNext(MediaType::Video, [](MovieFileOutput& output) { output.recordToOutputFileURL(std::nullopt); });
+HostTime CaptureRig::pauseAtNextPicture() {
+  return delegate_->atNext(MediaType::Video, [](MovieFileOutput& output) { output.pauseRecording(); });
 }
 
-HostTime CaptureRig::record(const std::filesystem::path& file, std::chrono::milliseconds time) {
-  const std::size_t before = delegate_->told().size();
-  const HostTime start = startAtNextPicture(file);
+HostTime CaptureRig::resumeAtNextPicture() {
+  return delegate_->atNext(MediaType::Video, [](MovieFileOutput& output) { output.resumeRecording(); });
+}
+
+HostTime CaptureRig::stopAtNextPicture() {
+  return delegate_->atNext(MediaType::Video,
+                           [](MovieFileOutput& output) { output.recordToOutputFileURL(std::nullopt); });
+}
+
+void CaptureRig::record(const std::filesystem::path& file, std::chrono::milliseconds time) {
+  startAtNextPicture(file);
   std::this_thread::sleep_for(time);
   stopAtNextPicture();
-  static_cast<void>(before);
-  delegate_->waitFor("did-finish");
-  return start;
+  ASSERT_TRUE(delegate_->waitForEnd(file));
+  const LMRErrorRef error = delegate_->lastError();
+  ASSERT_EQ(error, nullptr) << error->description();
+}
+
+void CaptureRig::expectError(CaptureErrorCode code) {
+  const LMRErrorRef error = delegate_->lastError();
+  ASSERT_NE(error, nullptr);
+  EXPECT_EQ(error->domain(), LMRCaptureErrorDomain);
+  EXPECT_EQ(error->code(), static_cast<std::int64_t>(code)) << error->description();
+}
+
+void CaptureRig::expectGoesOn() {
+  EXPECT_TRUE(session_->isRunning());
+  record(file("next.mov"), std::chrono::milliseconds(300));
+  EXPECT_TRUE(Movie(file("next.mov")).decodes());
 }
 
 } // namespace lumora::testing

@@ -29,14 +29,16 @@ public:
   /// Runs the action inside the message of the next sample of that type; returns the sample's time, or 0 when none
   /// came within 10 seconds.
   HostTime atNext(MediaType type, Action action);
-  /// Waits until so many such messages came; false after 20 seconds.
-  bool waitFor(const std::string& event, std::size_t count = 1);
+  /// Waits for a message about a file; false when it did not come within 20 seconds.
+  bool waitFor(const std::string& event, const std::filesystem::path& file);
+  bool waitForEnd(const std::filesystem::path& file);
   std::vector<Told> told() const;
   /// The events for one file, in order, separated by blanks.
   std::string events(const std::filesystem::path& file) const;
   /// The error of the last message.
   LMRErrorRef lastError() const;
-  std::size_t samples(MediaType type) const;
+  /// The times of the pictures that were shown so far.
+  std::vector<HostTime> pictures() const;
 
   void captureOutput_didStartRecordingToOutputFileAtURL_forConnections(const Output& output,
                                                                        const std::filesystem::path& file,
@@ -64,8 +66,7 @@ private:
   mutable std::mutex mutex_;
   mutable std::condition_variable changed_;
   std::vector<Told> told_;
-  std::size_t pictures_ = 0;
-  std::size_t sounds_ = 0;
+  std::vector<HostTime> pictures_;
   MediaType wanted_ = MediaType::Video;
   Action action_;
   HostTime actedAt_ = 0;
@@ -83,10 +84,16 @@ protected:
   void addCameraAndMicrophone();
   /// Starts the session with the output.
   void run();
-  /// Records for so long, from the next picture on, and waits for the end. The start's time.
-  HostTime record(const std::filesystem::path& file, std::chrono::milliseconds time);
+  /// Records about so long and waits for the end, which must be a good one.
+  void record(const std::filesystem::path& file, std::chrono::milliseconds time);
+  /// Each returns the time of the picture that it happened at.
   HostTime startAtNextPicture(const std::filesystem::path& file);
-  void stopAtNextPicture();
+  HostTime pauseAtNextPicture();
+  HostTime resumeAtNextPicture();
+  HostTime stopAtNextPicture();
+  /// Expects that the last recording ended with such an error, and that the session can record afterwards.
+  void expectError(CaptureErrorCode code);
+  void expectGoesOn();
   std::filesystem::path file(const std::string& name) const { return folder_ / name; }
 
   std::unique_ptr<HeadlessDevices> devices_;

@@ -1,18 +1,215 @@
 #include "CaptureRig.h"
+#include "Movie.h"
+#include "Tone.h"
+
+#include <cmath>
+#include <thread>
 
 namespace lumora::testing {
 
 using namespace std::chrono_literals;
 
-using Recording = CaptureRig;
+namespace {
 
-TEST_F(Recording, writesAMovie_whenCameraAndMicrophoneRun) {
+double seconds(HostTime time) {
+  return static_cast<double>(time) / 1e9;
+}
+
+} // namespace
+
+class Recording : public CaptureRig {
+protected:
+  /// The file times of the pictures that were shown from `from` on and before `to`.
+  std::vector<double> shown(HostTime from, HostTime to, double fileTimeOfFrom) const {
+    std::vector<double> times;
+    for (const HostTime time : delegate_->pictures()) {
+      if (time >= from && time < to) {
+        times.push_back(fileTimeOfFrom + seconds(time - from));
+      }
+    }
+    return times;
+  }
+
+  static void expectTimes(const std::vector<double>& actual, const std::vector<double>& expected) {
+    ASSERT_EQ(actual.size(), expected.size());
+    for (std::size_t i = 0; i < actual.size(); ++i) {
+      EXPECT_NEAR(actual[i], expected[i], 0.0011) << "picture " << i;
+    }
+  }
+};
+
+TEST_F(Recording, firstFrameIsTheSampleThatTriggeredTheStart_whenStartedInsideItsMessage) {
   addCameraAndMicrophone();
   run();
-  record(file("a.mov"), 3s);
+  const HostTime start = startAtNextPicture(file("a.mov"));
+  std::this_thread::sleep_for(1s);
+  const HostTime stop = stopAtNextPicture();
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
   EXPECT_EQ(delegate_->events(file("a.mov")), "did-start will-finish did-finish");
-  const LMRErrorRef error = delegate_->lastError();
-  EXPECT_EQ(error, nullptr) << error->description();
+  EXPECT_EQ(delegate_->lastError(), nullptr);
+  const Movie movie(file("a.mov"));
+  EXPECT_TRUE(movie.decodes());
+  // Each picture that was shown from the start to the stop is in the file, at its own time and no other.
+  expectTimes(movie.times("v"), shown(start, stop, 0));
+  EXPECT_EQ(movie.stream("v", "codec_name"), "h264");
+  EXPECT_EQ(movie.stream("v", "width"), "1280");
+  EXPECT_EQ(movie.stream("a", "codec_name"), "aac");
+  EXPECT_EQ(output_->outputFileURL(), std::nullopt);
+}
+
+TEST_F(Recording, pauseLeavesNoGapAndKeepsTheOffsetOfSound_whenResumed) {
+  addCameraAndMicrophone();
+  run();
+  const HostTime start = startAtNextPicture(file("a.mov"));
+  std::this_thread::sleep_for(3s);
+  const HostTime pause = pauseAtNextPicture();
+  std::this_thread::sleep_for(2s);
+  const HostTime resume = resumeAtNextPicture();
+  std::this_thread::sleep_for(2s);
+  const HostTime stop = stopAtNextPicture();
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  EXPECT_EQ(delegate_->events(file("a.mov")), "did-start did-pause did-resume will-finish did-finish");
+
+  const Movie movie(file("a.mov"));
+  EXPECT_TRUE(movie.decodes());
+  const double seam = seconds(pause - start);
+  const double length = seam + seconds(stop - resume);
+  EXPECT_NEAR(movie.duration(), length, 0.05);
+  std::vector<double> expected = shown(start, pause, 0);
+  const std::vector<double> second = shown(resume, stop, seam);
+  expected.insert(expected.end(), second.begin(), second.end());
+  expectTimes(movie.times("v"), expected);
+
+  // The microphone's tone never stops, so its phase tells which moment a sound is from: in the file it must jump at
+  // the seam by exactly the time of the pause, as the pictures do.
+  const Tone before = Tone::at(movie.sound(), seam - 1);
+  const Tone after = Tone::at(movie.sound(), seam + 1);
+  EXPECT_GT(before.amplitude, 0.1);
+  EXPECT_GT(after.amplitude, 0.1);
+  EXPECT_NEAR(Tone::shift(before, after, 2 + seconds(resume - pause)), 0, 0.0005) << "seconds";
+}
+
+TEST_F(Recording, writesTenFiles_whenOneSessionRecordsTenTimes) {
+  addCameraAndMicrophone();
+  run();
+  for (int i = 0; i < 10; ++i) {
+    const auto name = file(std::to_string(i) + ".mov");
+    record(name, 300ms);
+    EXPECT_EQ(delegate_->events(name), "did-start will-finish did-finish");
+    EXPECT_TRUE(Movie(name).decodes());
+    EXPECT_GE(Movie(name).times("v").size(), 8U);
+  }
+}
+
+TEST_F(Recording, nextFileBeginsWhereTheFirstEnds_whenAnotherIsBegunWhileRecording) {
+  addCameraAndMicrophone();
+  run();
+  const HostTime start = startAtNextPicture(file("a.mov"));
+  std::this_thread::sleep_for(500ms);
+  const HostTime change = startAtNextPicture(file("b.mov"));
+  EXPECT_EQ(output_->outputFileURL(), file("b.mov"));
+  std::this_thread::sleep_for(500ms);
+  const HostTime stop = stopAtNextPicture();
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  ASSERT_TRUE(delegate_->waitForEnd(file("b.mov")));
+  expectTimes(Movie(file("a.mov")).times("v"), shown(start, change, 0));
+  expectTimes(Movie(file("b.mov")).times("v"), shown(change, stop, 0));
+}
+
+TEST_F(Recording, finishesWithAnError_whenStoppedBeforeTheFirstSample) {
+  addCameraAndMicrophone();
+  ASSERT_EQ(session_->addOutput(output_), nullptr);
+  output_->recordToOutputFileURL(file("a.mov"));
+  EXPECT_EQ(output_->outputFileURL(), file("a.mov"));
+  output_->recordToOutputFileURL(std::nullopt);
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  expectError(CaptureErrorCode::NothingRecorded);
+  EXPECT_EQ(delegate_->events(file("a.mov")), "did-finish");
+  EXPECT_FALSE(std::filesystem::exists(file("a.mov")));
+  ASSERT_EQ(session_->startRunning(), nullptr);
+  expectGoesOn();
+}
+
+TEST_F(Recording, hasOnlyTheTracksOfEnabledConnections_whenOneIsDisabled) {
+  addCameraAndMicrophone();
+  session_->inputs()[1]->connections()[0]->setEnabled(false);
+  run();
+  record(file("a.mov"), 300ms);
+  EXPECT_EQ(Movie(file("a.mov")).stream("a", "codec_name"), "");
+}
+
+TEST_F(Recording, endsATrackAndGoesOn_whenItsConnectionIsDisabledMeanwhile) {
+  addCameraAndMicrophone();
+  run();
+  startAtNextPicture(file("a.mov"));
+  std::this_thread::sleep_for(500ms);
+  session_->inputs()[1]->connections()[0]->setEnabled(false);
+  std::this_thread::sleep_for(1s);
+  stopAtNextPicture();
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  EXPECT_EQ(delegate_->lastError(), nullptr);
+  const Movie movie(file("a.mov"));
+  EXPECT_TRUE(movie.decodes());
+  EXPECT_GT(movie.times("v").back(), movie.times("a").back() + 0.5);
+}
+
+TEST_F(Recording, encodesAsWished_whenCompressionOptionsAreSet) {
+  addCameraAndMicrophone();
+  ASSERT_EQ(session_->addOutput(output_), nullptr);
+  output_->setCompressionOptions_forConnection({"mjpeg", {}, 640, 360}, output_->connections()[0]);
+  output_->setCompressionOptions_forConnection({"pcm", {}, {}, {}}, output_->connections()[1]);
+  ASSERT_EQ(session_->startRunning(), nullptr);
+  record(file("a.mov"), 300ms);
+  const Movie movie(file("a.mov"));
+  EXPECT_TRUE(movie.decodes());
+  EXPECT_EQ(movie.stream("v", "codec_name"), "mjpeg");
+  EXPECT_EQ(movie.stream("v", "width"), "640");
+  EXPECT_EQ(movie.stream("a", "codec_name"), "pcm_s16le");
+}
+
+TEST_F(Recording, finishesWithAnError_whenTheCodecIsUnknown) {
+  addCameraAndMicrophone();
+  run();
+  output_->setCompressionOptions_forConnection({"smoke-signals", {}, {}, {}}, output_->connections()[0]);
+  startAtNextPicture(file("a.mov"));
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  expectError(CaptureErrorCode::EncoderMissing);
+}
+
+TEST_F(Recording, recordsTheScreenWithAMicrophone_whenAnXServerRuns) {
+  ASSERT_EQ(session_->addInput(capture().makeScreenInput()), nullptr);
+  addDevice("audio:lumora_microphone");
+  run();
+  record(file("a.mov"), 1s);
+  const Movie movie(file("a.mov"));
+  EXPECT_TRUE(movie.decodes());
+  EXPECT_EQ(movie.stream("v", "height"), "720");
+  EXPECT_EQ(movie.stream("a", "codec_name"), "aac");
+}
+
+TEST_F(Recording, isFinished_whenTheSessionStops) {
+  addCameraAndMicrophone();
+  run();
+  startAtNextPicture(file("a.mov"));
+  std::this_thread::sleep_for(500ms);
+  session_->stopRunning();
+  EXPECT_FALSE(session_->isRunning());
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  EXPECT_EQ(delegate_->lastError(), nullptr);
+  EXPECT_TRUE(Movie(file("a.mov")).decodes());
+  ASSERT_EQ(session_->startRunning(), nullptr);
+  expectGoesOn();
+}
+
+TEST_F(Recording, isFinished_whenTheOutputIsRemoved) {
+  addCameraAndMicrophone();
+  run();
+  startAtNextPicture(file("a.mov"));
+  std::this_thread::sleep_for(500ms);
+  session_->removeOutput(output_);
+  EXPECT_TRUE(output_->connections().empty());
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  EXPECT_TRUE(Movie(file("a.mov")).decodes());
 }
 
 } // namespace lumora::testing

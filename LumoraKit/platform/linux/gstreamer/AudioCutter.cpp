@@ -53,6 +53,8 @@ std::optional<AudioCutter::Piece> AudioCutter::place(const Timeline::Span& span,
     first += expected - wanted;
   }
   if (first >= end) {
+    // All of it is in the file already: what follows is placed by its time stamp, as at a seam.
+    section_.reset();
     return std::nullopt;
   }
   const Piece piece{silence, first, end - first, written_};

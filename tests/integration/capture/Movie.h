@@ -1,0 +1,31 @@
+#pragma once
+
+#include <filesystem>
+#include <string>
+#include <vector>
+
+namespace lumora::testing {
+
+/// What ffprobe and ffmpeg say of a movie file.
+class Movie {
+public:
+  explicit Movie(std::filesystem::path file) : file_(std::move(file)) {}
+
+  /// Whether every packet decodes without a complaint.
+  bool decodes() const;
+  /// In seconds.
+  double duration() const;
+  /// One value of the first stream of a type ("v" or "a"), as ffprobe prints it; empty without such a stream.
+  std::string stream(const std::string& type, const std::string& entry) const;
+  /// When the packets of the first stream of a type are shown, in seconds, in order.
+  std::vector<double> times(const std::string& type) const;
+  /// The left channel, decoded at 48 kHz, with silence where the file has none.
+  std::vector<double> sound() const;
+
+private:
+  std::string probe(const std::string& arguments) const;
+
+  std::filesystem::path file_;
+};
+
+} // namespace lumora::testing
