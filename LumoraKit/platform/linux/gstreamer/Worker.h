@@ -12,7 +12,7 @@ namespace lumora::backend {
 template <class Work> auto startOnWorker(Queues& queues, Work work) {
   using Result = decltype(work());
   auto task = std::make_shared<std::packaged_task<Result()>>(std::move(work));
-  queues.highPriorityQueue()->async([task] { (*task)(); });
+  queues.concurrentQueue()->async([task] { (*task)(); });
   return task->get_future();
 }
 
