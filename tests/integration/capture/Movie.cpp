@@ -30,7 +30,7 @@ Result shell(const std::string& command) {
 } // namespace
 
 bool Movie::decodes() const {
-  const Result result = shell("ffmpeg -v error -xerror -i '" + file_.string() + "' -f null - 2>&1");
+  const Result result = shell("ffmpeg -v error -xerror -i '" + file_.string() + "' -fps_mode vfr -f null - 2>&1");
   std::fputs(result.output.c_str(), stderr);
   return result.status == 0 && result.output.empty();
 }
