@@ -1,3 +1,5 @@
+#include "support/TemporaryFolder.h"
+
 #include <LumoraKit/actions/LMRStatusCodes.h>
 #include <LumoraKit/login/LMRLocalizedTables.h>
 #include <LumoraKit/testing/FakePlatform.h>
@@ -7,11 +9,11 @@
 
 #include <algorithm>
 #include <filesystem>
-#include <fstream>
 #include <iterator>
-#include <regex>
 #include <set>
 #include <string>
+#include <string_view>
+#include <vector>
 
 using lumora::LocalizedTable;
 using lumora::localizedTables;
@@ -91,18 +93,29 @@ TEST(TablesTest, holdTheMessageOfEveryStatus) {
   }
 }
 
-// The keys that stand as literals in the framework's sources, in the calls that localise them.
+// Adds the keys that stand as literals in calls of a function.
+void addLiteralKeys(std::string_view source, const std::string& function, std::set<std::string>& keys) {
+  const std::string call = function + "(\"";
+  for (auto place = source.find(call); place != std::string_view::npos; place = source.find(call, place)) {
+    place += call.size();
+    const auto literal = source.substr(place, source.find('"', place) - place);
+    std::string key(literal);
+    // The one escape that keys hold.
+    if (const auto escape = key.find("\\\\U"); escape != std::string::npos) {
+      key.erase(escape, 1);
+    }
+    keys.insert(key);
+  }
+}
+
+// The keys of the framework's sources.
 std::set<std::string> literalKeys() {
-  static const std::regex call(R"-((?:LMRLocalizedString|missingDevice)\(\s*"((?:[^"\\]|\\.)*)"\s*\))-");
   std::set<std::string> keys;
   for (const auto& file : std::filesystem::recursive_directory_iterator(LUMORA_SOURCE_DIR "/LumoraKit")) {
-    if (file.path().extension() != ".cpp") {
-      continue;
-    }
-    std::ifstream stream(file.path());
-    const std::string source(std::istreambuf_iterator<char>(stream), {});
-    for (std::sregex_iterator match(source.begin(), source.end(), call), end; match != end; ++match) {
-      keys.insert(std::regex_replace((*match)[1].str(), std::regex(R"(\\(.))"), "$1"));
+    if (file.path().extension() == ".cpp") {
+      const std::string source = lumora::tests::contentOf(file.path());
+      addLiteralKeys(source, "LMRLocalizedString", keys);
+      addLiteralKeys(source, "missingDevice", keys);
     }
   }
   return keys;
