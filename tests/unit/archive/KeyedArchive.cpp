@@ -2,6 +2,8 @@
 #include <LumoraKit/platform/Log.h>
 #include <LumoraKit/platform/PropertyList.h>
 
+#include <gtest/gtest.h>
+
 using namespace lumora;
 
 namespace {

@@ -2,6 +2,8 @@
 
 #include <LumoraKit/platform/Log.h>
 
+#include <gtest/gtest.h>
+
 using namespace lumora;
 using namespace lumora::tests;
 

@@ -2,6 +2,8 @@
 
 #include <LumoraKit/platform/Log.h>
 
+#include <gtest/gtest.h>
+
 #include <cmath>
 #include <limits>
 

@@ -2,6 +2,8 @@
 
 #include <LumoraKit/platform/Value.h>
 
+#include <gtest/gtest.h>
+
 using namespace lumora;
 
 namespace {

@@ -1,6 +1,8 @@
 #include <LumoraKit/platform/Log.h>
 #include <LumoraKit/testing/FakePlatform.h>
 
+#include <gtest/gtest.h>
+
 #include <cerrno>
 
 using namespace lumora;
