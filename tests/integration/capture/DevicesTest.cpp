@@ -1,5 +1,7 @@
 #include "CaptureRig.h"
 
+#include <gmock/gmock.h>
+
 #include <cstdlib>
 
 namespace lumora::testing {

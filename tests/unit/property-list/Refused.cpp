@@ -2,7 +2,7 @@
 
 #include <LumoraKit/platform/Log.h>
 
-#include <gtest/gtest.h>
+#include <gmock/gmock.h>
 
 using namespace lumora;
 using namespace lumora::tests;

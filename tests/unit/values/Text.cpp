@@ -1,7 +1,7 @@
 #include <LumoraKit/platform/Log.h>
 #include <LumoraKit/testing/FakePlatform.h>
 
-#include <gtest/gtest.h>
+#include <gmock/gmock.h>
 
 #include <cerrno>
 
