@@ -3,6 +3,7 @@
 #include <LumoraKit/platform/ValueText.h>
 
 #include <algorithm>
+#include <array>
 #include <iterator>
 #include <utility>
 
@@ -38,30 +39,27 @@ std::string excerpt(std::string_view text) {
 
 PropertyListBuilder::PropertyListBuilder(bool dictionaryOnly) : dictionaryOnly_(dictionaryOnly) {}
 
-// Sorted out by length first: this runs for every element.
 PropertyListBuilder::Element PropertyListBuilder::elementNamed(std::string_view name) {
-  switch (name.size()) {
-  case 3:
-    return name == "key" ? Element::Key : Element::Unknown;
-  case 4:
-    return name == "dict"   ? Element::Dictionary
-           : name == "true" ? Element::True
-           : name == "date" ? Element::Date
-           : name == "data" ? Element::Data
-           : name == "real" ? Element::Real
-                            : Element::Unknown;
-  case 5:
-    return name == "array"   ? Element::Array
-           : name == "false" ? Element::False
-           : name == "plist" ? Element::PropertyList
-                             : Element::Unknown;
-  case 6:
-    return name == "string" ? Element::String : Element::Unknown;
-  case 7:
-    return name == "integer" ? Element::Integer : Element::Unknown;
-  default:
-    return Element::Unknown;
+  // The usual ones first: this runs for every element.
+  static constexpr std::array<std::pair<std::string_view, Element>, 11> elements = {{
+      {"key", Element::Key},
+      {"string", Element::String},
+      {"dict", Element::Dictionary},
+      {"array", Element::Array},
+      {"integer", Element::Integer},
+      {"true", Element::True},
+      {"false", Element::False},
+      {"real", Element::Real},
+      {"date", Element::Date},
+      {"data", Element::Data},
+      {"plist", Element::PropertyList},
+  }};
+  for (const auto& [text, element] : elements) {
+    if (text == name) {
+      return element;
+    }
   }
+  return Element::Unknown;
 }
 
 bool PropertyListBuilder::isCollection(Element element) {

@@ -124,7 +124,7 @@ void Writer::date(Date date) {
 }
 
 void Writer::data(const Data& bytes) {
-  constexpr std::size_t bytesInLine = 76 / 4 * 3;
+  constexpr std::size_t bytesInLine = std::size_t{76} / 4 * 3;
   indent();
   text_ += "<data>\n";
   for (std::size_t at = 0; at < bytes.size(); at += bytesInLine) {

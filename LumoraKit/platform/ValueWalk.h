@@ -40,7 +40,7 @@ public:
 private:
   // What is left of an open collection.
   struct Level {
-    Collection kind;
+    Collection kind{};
     const Value* element = nullptr;
     const Value* elementsEnd = nullptr;
     const Dictionary::Entry* entry = nullptr;

@@ -91,14 +91,14 @@ std::vector<std::filesystem::path> FakeFiles::files() const {
 }
 
 bool FakeFiles::hasDirectory(const std::filesystem::path& path) const {
-  return directories_.count(path) > 0;
+  return directories_.contains(path);
 }
 
 int FakeFiles::createParents(const std::filesystem::path& path) {
   std::filesystem::path current;
   for (const auto& part : path) {
     current /= part;
-    if (files_.count(current) > 0) {
+    if (files_.contains(current)) {
       return EEXIST;
     }
     directories_.insert(current);

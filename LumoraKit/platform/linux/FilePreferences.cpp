@@ -42,7 +42,7 @@ std::string fileName(std::string_view domain) {
 std::optional<std::string> contentOf(const std::filesystem::path& path) {
   const FileDescriptor file(open(path.c_str(), O_RDONLY | O_CLOEXEC));
   std::string content;
-  std::array<char, 16 * 1024> buffer{};
+  std::array<char, std::size_t{16} * 1024> buffer{};
   while (file.isOpen()) {
     const ssize_t count = read(file.get(), buffer.data(), buffer.size());
     if (count == 0) {

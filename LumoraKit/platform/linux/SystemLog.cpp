@@ -18,7 +18,7 @@ namespace {
 
 constexpr int patienceMilliseconds = 50;
 // Well below what a datagram socket takes at once.
-constexpr std::size_t longestLine = 64 * 1024;
+constexpr std::size_t longestLine = std::size_t{64} * 1024;
 
 // RFC 3164 as the local daemons read it: "<14>Jan 20 15:04:05 program[123]: ". No locale: the month is English.
 std::string recordHead() {

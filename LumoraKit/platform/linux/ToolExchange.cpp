@@ -15,8 +15,8 @@ namespace {
 constexpr std::chrono::milliseconds graceAfterEnd{200};
 // How often the child is asked for its end when the system gave no descriptor for that.
 constexpr int reapIntervalMilliseconds = 20;
-constexpr std::size_t readSize = 64 * 1024;
-constexpr std::size_t largeText = 1024 * 1024;
+constexpr std::size_t readSize = std::size_t{64} * 1024;
+constexpr std::size_t largeText = std::size_t{1024} * 1024;
 
 bool isTemporary(int error) {
   return error == EAGAIN || error == EINTR;

@@ -18,7 +18,7 @@ std::filesystem::path absoluteFromEnvironment(const char* variable) {
 }
 
 std::filesystem::path homeFromUserDatabase() {
-  std::vector<char> buffer(16 * 1024);
+  std::vector<char> buffer(std::size_t{16} * 1024);
   passwd entry{};
   passwd* found = nullptr;
   getpwuid_r(getuid(), &entry, buffer.data(), buffer.size(), &found);

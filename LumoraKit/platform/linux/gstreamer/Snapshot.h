@@ -14,10 +14,7 @@ public:
   /// Keeps the value that it shows alive. Short-lived: values that were replaced meanwhile wait for its end.
   class Reading {
   public:
-    explicit Reading(const Snapshot& snapshot) : snapshot_(snapshot) {
-      snapshot_.readers_.fetch_add(1);
-      value_ = snapshot_.current_.load();
-    }
+    explicit Reading(const Snapshot& snapshot) : snapshot_(snapshot), value_(snapshot.enter()) {}
     Reading(const Reading&) = delete;
     Reading& operator=(const Reading&) = delete;
     ~Reading() { snapshot_.readers_.fetch_sub(1); }
@@ -47,6 +44,11 @@ public:
   }
 
 private:
+  const T* enter() const {
+    readers_.fetch_add(1);
+    return current_.load();
+  }
+
   std::mutex mutex_;
   std::vector<std::unique_ptr<const T>> values_;
   std::atomic<const T*> current_{nullptr};
