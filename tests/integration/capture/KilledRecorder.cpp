@@ -16,6 +16,9 @@
 #include <unistd.h>
 
 namespace lumora::testing {
+
+using namespace std::chrono_literals;
+
 namespace {
 
 bool addDevice(MediaCapture& capture, CaptureSession& session, const char* uniqueID) {
@@ -67,11 +70,32 @@ protected:
     return size > 0 ? std::strtoull(text, nullptr, 10) : 0;
   }
 
+  /// Copies the file as a death of the recorder at this moment would leave it; the moment's time.
+  HostTime copyAsIfKilled(const std::filesystem::path& from, const std::filesystem::path& to) const {
+    const HostTime time = capture().hostTime();
+    ::kill(pid_, SIGSTOP);
+    int status = 0;
+    ::waitpid(pid_, &status, WUNTRACED);
+    std::filesystem::copy_file(from, to);
+    ::kill(pid_, SIGCONT);
+    return time;
+  }
+
   HostTime killRecorder() const {
     const HostTime time = capture().hostTime();
     ::kill(pid_, SIGKILL);
     ::waitpid(pid_, nullptr, 0);
     return time;
+  }
+
+  static void expectComplete(const std::filesystem::path& file, HostTime time) {
+    const double recorded = static_cast<double>(time) / 1e9;
+    const Movie movie(file);
+    ASSERT_FALSE(movie.times("v").empty());
+    ASSERT_FALSE(movie.times("a").empty());
+    EXPECT_TRUE(movie.decodes());
+    EXPECT_GT(movie.times("v").back(), recorded - 1.2);
+    EXPECT_GT(movie.times("a").back(), recorded - 1.2);
   }
 
 private:
@@ -81,15 +105,18 @@ private:
 TEST_F(KilledRecorder, leavesAPlayableFileThatLacksTheLastSecondAtMost_whenKilled) {
   const HostTime start = startRecorder(file("a.mov"));
   ASSERT_NE(start, 0U);
-  // Not a multiple of the fragments' second: the worst case is just before one is complete.
-  std::this_thread::sleep_for(std::chrono::milliseconds(3900));
-  const double recorded = static_cast<double>(killRecorder() - start) / 1e9;
-  const Movie movie(file("a.mov"));
-  ASSERT_FALSE(movie.times("v").empty());
-  ASSERT_FALSE(movie.times("a").empty());
-  EXPECT_TRUE(movie.decodes());
-  EXPECT_GT(movie.times("v").back(), recorded - 1.2);
-  EXPECT_GT(movie.times("a").back(), recorded - 1.2);
+  std::this_thread::sleep_for(2s);
+  // Whatever is being written at that moment.
+  std::vector<HostTime> times;
+  for (int i = 0; i < 8; ++i) {
+    std::this_thread::sleep_for(170ms);
+    times.push_back(copyAsIfKilled(file("a.mov"), file(std::to_string(i) + ".mov")) - start);
+  }
+  const HostTime killed = killRecorder() - start;
+  expectComplete(file("a.mov"), killed);
+  for (std::size_t i = 0; i < times.size(); ++i) {
+    expectComplete(file(std::to_string(i) + ".mov"), times[i]);
+  }
 }
 
 } // namespace lumora::testing

@@ -6,9 +6,11 @@
 namespace lumora::backend {
 namespace {
 
-// Every second a fragment is completed, so that a file whose writer died can be played up to there; in the end the
-// fragments become an ordinary file. Unbuffered: what is written is with the kernel at once.
-constexpr const char* container = "qtmux name=mux fragment-duration=1000 fragment-mode=first-moov-then-finalise ! "
+// Every second a fragment is completed, so that a file whose writer died can be played up to there. The muxer's other
+// mode, which turns the fragments into one index at the end, is of no use: it leaves out the size of a sample that is
+// as large as its fragment's first one, and then a reader gives up the whole file unless it was finished.
+// Unbuffered: what is written is with the kernel at once.
+constexpr const char* container = "qtmux name=mux fragment-duration=1000 fragment-mode=dash-or-mss ! "
                                   "filesink name=file async=false buffer-mode=unbuffered";
 constexpr const char* source =
     " appsrc name=%NAME format=time is-live=true block=false max-bytes=0 max-buffers=0 max-time=0 ! ";
