@@ -6,11 +6,11 @@
 namespace lumora::backend {
 namespace {
 
-// Every second a fragment is completed, so that a file whose writer died can be played up to there. The muxer's other
+// Every 0.8 s a fragment is completed, so that a file whose writer died can be played up to there. The muxer's other
 // mode, which turns the fragments into one index at the end, is of no use: it leaves out the size of a sample that is
 // as large as its fragment's first one, and then a reader gives up the whole file unless it was finished.
 // Unbuffered: what is written is with the kernel at once.
-constexpr const char* container = "qtmux name=mux fragment-duration=1000 fragment-mode=dash-or-mss ! "
+constexpr const char* container = "qtmux name=mux fragment-duration=800 fragment-mode=dash-or-mss ! "
                                   "filesink name=file async=false buffer-mode=unbuffered";
 constexpr const char* source =
     " appsrc name=%NAME format=time is-live=true block=false max-bytes=0 max-buffers=0 max-time=0 ! ";
@@ -27,7 +27,8 @@ std::string sourceName(std::size_t track) {
   return "track" + std::to_string(track);
 }
 
-// The picture that the encoder gets, whatever happens to the camera's format: a change would spoil the file.
+// A key picture begins each fragment. The picture that the encoder gets is fixed, whatever happens to the camera's
+// format: a change would spoil the file.
 std::string videoLine(const TrackFormat& track) {
   GstVideoInfo info;
   gst_video_info_from_caps(&info, track.caps.get());
@@ -43,7 +44,7 @@ std::string videoLine(const TrackFormat& track) {
   return std::string("videoconvertscale ! video/x-raw,pixel-aspect-ratio=1/1,format=") + track.encoder->rawFormat +
          ",width=" + std::to_string(width & ~1U) + ",height=" + std::to_string(height & ~1U) +
          ",colorimetry=" + (colorimetry ? colorimetry.get() : GST_VIDEO_COLORIMETRY_BT709) + " ! " +
-         track.encoder->launchLine(bitRate, std::max(framesASecond, 1U));
+         track.encoder->launchLine(bitRate, std::max(framesASecond * 4 / 5, 1U));
 }
 
 std::string soundLine(const TrackFormat& track) {
