@@ -15,6 +15,7 @@ Platform makeMachinePlatform() {
   Platform platform;
   platform.application = backend::makeApplication();
   platform.files = backend::makeFiles();
+  platform.helperAgent = backend::makeHelperAgent();
   platform.log = backend::makeSystemLog();
   platform.mainThread = backend::makeMainThread();
   platform.notificationCenter = std::make_shared<NotificationCenter>();
@@ -27,9 +28,9 @@ Platform makeMachinePlatform() {
 }
 
 bool isComplete(const Platform& platform) {
-  return platform.application && platform.files && platform.log && platform.mainThread && platform.mediaCapture &&
-         platform.notificationCenter && platform.preferences && platform.queues && platform.toolRunner &&
-         platform.wallClock;
+  return platform.application && platform.files && platform.helperAgent && platform.log && platform.mainThread &&
+         platform.mediaCapture && platform.notificationCenter && platform.preferences && platform.queues &&
+         platform.toolRunner && platform.wallClock;
 }
 
 // Every platform that was ever installed stays: references to it are handed out without a count, and a detached

@@ -8,6 +8,7 @@ namespace lumora {
 
 class Application;
 class Files;
+class HelperAgent;
 class Log;
 class MainThread;
 class MediaCapture;
@@ -28,6 +29,7 @@ class WallClock;
 struct LUMORA_EXPORT Platform {
   std::shared_ptr<Application> application;
   std::shared_ptr<Files> files;
+  std::shared_ptr<HelperAgent> helperAgent;
   std::shared_ptr<Log> log;
   std::shared_ptr<MainThread> mainThread;
   std::shared_ptr<MediaCapture> mediaCapture;

@@ -14,6 +14,7 @@ void FakePlatform::install() const {
   Platform platform = previous_;
   platform.application = application;
   platform.files = files;
+  platform.helperAgent = helperAgent;
   platform.log = log;
   platform.mediaCapture = mediaCapture;
   platform.notificationCenter = notificationCenter;

@@ -4,6 +4,7 @@
 #include <LumoraKit/platform/Platform.h>
 #include <LumoraKit/testing/FakeApplication.h>
 #include <LumoraKit/testing/FakeFiles.h>
+#include <LumoraKit/testing/FakeHelperAgent.h>
 #include <LumoraKit/testing/FakeMediaCapture.h>
 #include <LumoraKit/testing/FakePreferences.h>
 #include <LumoraKit/testing/FakeToolRunner.h>
@@ -31,6 +32,7 @@ struct LUMORA_EXPORT FakePlatform {
 
   std::shared_ptr<FakeApplication> application = std::make_shared<FakeApplication>();
   std::shared_ptr<FakeFiles> files = std::make_shared<FakeFiles>();
+  std::shared_ptr<FakeHelperAgent> helperAgent = std::make_shared<FakeHelperAgent>();
   std::shared_ptr<RecordingLog> log = std::make_shared<RecordingLog>();
   std::shared_ptr<FakeMediaCapture> mediaCapture = std::make_shared<FakeMediaCapture>();
   std::shared_ptr<NotificationCenter> notificationCenter = std::make_shared<NotificationCenter>();

@@ -11,6 +11,7 @@ namespace lumora {
 
 class Application;
 class Files;
+class HelperAgent;
 class Log;
 class MainThread;
 class MediaCapture;
@@ -25,6 +26,8 @@ namespace backend {
 std::shared_ptr<Application> makeApplication();
 /// POSIX files and XDG folders.
 std::shared_ptr<Files> makeFiles();
+/// The machine's D-Bus services.
+std::shared_ptr<HelperAgent> makeHelperAgent();
 /// syslog(3).
 std::shared_ptr<Log> makeSystemLog();
 /// GLib's default main context.

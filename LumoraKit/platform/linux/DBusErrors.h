@@ -1,0 +1,16 @@
+#pragma once
+
+#include <LumoraKit/platform/KTHelperAgent.h>
+
+#include <gio/gio.h>
+
+#include <string>
+
+namespace lumora::backend {
+
+LUMORA_INTERNAL LMRErrorRef helperAgentError(HelperAgentError code, std::string text);
+
+/// What a failed call of an agent means for its caller.
+LUMORA_INTERNAL LMRErrorRef helperAgentCallError(const GError& error, const std::string& agent);
+
+} // namespace lumora::backend
