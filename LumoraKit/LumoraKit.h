@@ -8,8 +8,11 @@
 #include <LumoraKit/actions/LMRActionFactoryAdditions.h>
 #include <LumoraKit/actions/LMRApplicationSupportDirectory.h>
 #include <LumoraKit/actions/LMRMetadataKeys.h>
+#include <LumoraKit/actions/LMRPrivilegedAction.h>
 #include <LumoraKit/actions/LMRReplyKeys.h>
 #include <LumoraKit/actions/LMRSession.h>
+#include <LumoraKit/actions/LMRToolAction.h>
+#include <LumoraKit/actions/LMRToolActionFactory.h>
 #include <LumoraKit/actions/LMRToolPaths.h>
 #include <LumoraKit/login/LMRAuthenticationAction.h>
 #include <LumoraKit/login/LMRFrameworkStub.h>
@@ -25,6 +28,7 @@
 #include <LumoraKit/platform/KTAction.h>
 #include <LumoraKit/platform/KTActionLoggingProtocol.h>
 #include <LumoraKit/platform/KTActionQueue.h>
+#include <LumoraKit/platform/KTHelperAgent.h>
 #include <LumoraKit/platform/KTHost.h>
 #include <LumoraKit/platform/KTRunTask.h>
 #include <LumoraKit/platform/KeyedArchive.h>
@@ -49,3 +53,4 @@
 #include <LumoraKit/recording/LMRRecorderClasses.h>
 #include <LumoraKit/recording/LMRSourceRecorder.h>
 #include <LumoraKit/recording/LMRSourceRecorderDelegate.h>
+#include <LumoraKit/workflows/LMRWorkflowAdditions.h>

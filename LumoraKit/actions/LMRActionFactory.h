@@ -2,6 +2,7 @@
 
 #include <LumoraKit/actions/LMRAction.h>
 #include <LumoraKit/actions/LMRMetadataKeys.h>
+#include <LumoraKit/actions/LMRPrivilegedAction.h>
 #include <LumoraKit/actions/LMRReplyKeys.h>
 #include <LumoraKit/actions/LMRSession.h>
 #include <LumoraKit/platform/Value.h>
@@ -15,7 +16,8 @@
 /// Makes the actions of the server's commands, ready to run: the caller attaches targets and starts them. Any thread.
 ///
 /// A word that is absent is sent as its key alone, and the tool answers with an error of its own; what a method must
-/// have is asserted. Paths are taken as they are.
+/// have is asserted. Paths are taken as they are. Unless a method says otherwise its action has a result, and no reply
+/// is looked into: LMRReplyKeys.h names what the tools put there.
 class LUMORA_EXPORT LMRActionFactory {
 public:
   LMRActionFactory() = delete;
@@ -27,6 +29,57 @@ public:
 
   /// Lists the workflows that the user may submit to; LMRWorkflowsKey in the result.
   static std::shared_ptr<LMRAction> actionToListWorkflowsWithSession(std::shared_ptr<LMRSession> session);
+
+  /// Describes one workflow.
+  static std::shared_ptr<LMRAction>
+  actionToGetWorkflowInformationWithUUID_withSession(const std::optional<std::string>& uuid,
+                                                     std::shared_ptr<LMRSession> session);
+
+  /// Installs a workflow from a file of this machine.
+  /// \param masterPassword of the workflow; not sent when absent
+  /// \param overwrite whether it may replace an installed one
+  static std::shared_ptr<LMRAction> actionToInstallWorkflowFromPath_withMasterPassword_overwrite_withSession(
+      const std::optional<std::string>& path, const std::optional<std::string>& masterPassword, bool overwrite,
+      std::shared_ptr<LMRSession> session);
+
+  /// Writes a workflow into a file of this machine.
+  static std::shared_ptr<LMRAction>
+  actionToDownloadWorkflowWithUUID_toPath_withSession(const std::optional<std::string>& uuid,
+                                                      const std::optional<std::string>& path,
+                                                      std::shared_ptr<LMRSession> session);
+
+  static std::shared_ptr<LMRAction> actionToDeleteWorkflowWithUUID_withSession(const std::optional<std::string>& uuid,
+                                                                               std::shared_ptr<LMRSession> session);
+
+  /// Makes a container for one recording of several sources; LMRRecordingContainerUUIDKey and LMRSubmissionUUIDSKey in
+  /// the result.
+  static std::shared_ptr<LMRAction>
+  actionToCreateRecordingContainerForWorkflowUUID_session(const std::optional<std::string>& uuid,
+                                                          std::shared_ptr<LMRSession> session);
+
+  /// Lists the cameras that the server can record with; LMRCamerasKey in the result.
+  static std::shared_ptr<LMRAction> actionToListRemoteCamerasWithSession(std::shared_ptr<LMRSession> session);
+
+  static std::shared_ptr<LMRAction> actionToGetStatusForRemoteCamera_session(const std::optional<std::string>& camera,
+                                                                             std::shared_ptr<LMRSession> session);
+
+  /// The status with a new picture; LMRCameraPreviewDataKey in the result.
+  static std::shared_ptr<LMRAction>
+  actionToUpdatePreviewImageForRemoteCamera_session(const std::optional<std::string>& camera,
+                                                    std::shared_ptr<LMRSession> session);
+
+  /// \param delay seconds that the server waits before the camera records
+  static std::shared_ptr<LMRAction>
+  actionToStartRemoteCamera_afterDelay_audioOnly_session(const std::optional<std::string>& camera, std::uint64_t delay,
+                                                         bool audioOnly, std::shared_ptr<LMRSession> session);
+
+  static std::shared_ptr<LMRAction> actionToPauseRemoteCamera_session(const std::optional<std::string>& camera,
+                                                                      std::shared_ptr<LMRSession> session);
+  static std::shared_ptr<LMRAction> actionToResumeRemoteCamera_session(const std::optional<std::string>& camera,
+                                                                       std::shared_ptr<LMRSession> session);
+  /// Ends the recording and throws it away.
+  static std::shared_ptr<LMRAction> actionToCancelRemoteCamera_session(const std::optional<std::string>& camera,
+                                                                       std::shared_ptr<LMRSession> session);
 
   /// Submits one file. The metadata are written to files at once (LMRActionFactoryAdditions); one that cannot be
   /// written is sent as its key alone. The action has no result.
@@ -68,4 +121,35 @@ public:
   static std::shared_ptr<LMRAction> actionToStopRemoteCamera_andSubmitToSubmissionUUID_withMetadata_session(
       const std::optional<std::string>& camera, const std::optional<std::string>& submissionUUID,
       const std::optional<lumora::Dictionary>& userMetadata, std::shared_ptr<LMRSession> session);
+
+  /// The transfers of this machine that run or have ended. Asks no server.
+  static std::shared_ptr<LMRAction> actionToListCurrentTransfers();
+  /// Forgets the transfers that have ended.
+  static std::shared_ptr<LMRAction> actionToClearCurrentTransfersList();
+
+  /// Whether this machine's camera is shared; LMRCameraBindingStatusKey in the result.
+  static std::shared_ptr<LMRAction> actionToGetCameraBindingStatus();
+  /// How this machine's camera is shared; LMRRemoteRecorder...Key in the result.
+  static std::shared_ptr<LMRAction> actionToGetRemoteRecorderConfiguration();
+
+  /// Changes one setting of this machine's shared camera.
+  /// \param value,key required, not empty
+  /// \param key one of LMRRemoteRecorder...Key
+  /// \param authorization required; must outlive the action
+  static std::shared_ptr<LMRPrivilegedAction>
+  actionToSetRemoteRecorderConfigurationValue_forKey_authorization(const std::optional<std::string>& value,
+                                                                   const std::optional<std::string>& key,
+                                                                   lumora::AuthorizationRef authorization);
+
+  /// Shares this machine's camera under a name with the session's server.
+  /// \param session required; must authenticate by password (asserted when the action runs)
+  /// \param authorization required; must outlive the action
+  static std::shared_ptr<LMRPrivilegedAction>
+  actionToBindCamera_session_authorization(const std::optional<std::string>& camera,
+                                           std::shared_ptr<LMRSession> session, lumora::AuthorizationRef authorization);
+  /// Ends the sharing; the same parameters.
+  static std::shared_ptr<LMRPrivilegedAction>
+  actionToUnbindCamera_session_authorization(const std::optional<std::string>& camera,
+                                             std::shared_ptr<LMRSession> session,
+                                             lumora::AuthorizationRef authorization);
 };

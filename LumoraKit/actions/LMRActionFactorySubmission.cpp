@@ -1,22 +1,18 @@
 // The methods of LMRActionFactory that hand recordings to a workflow.
 #include <LumoraKit/actions/LMRActionFactory.h>
 #include <LumoraKit/actions/LMRActionFactoryAdditions.h>
+#include <LumoraKit/actions/LMRFactoryParts.h>
 #include <LumoraKit/actions/LMRRequest.h>
-#include <LumoraKit/login/LMRLocalizedString.h>
-#include <LumoraKit/platform/Assert.h>
 
 #include <utility>
 
 using lumora::requestPair;
+using lumora::requireForFactory;
 
 namespace {
 
 using OptionalText = std::optional<std::string>;
 using OptionalMetadata = std::optional<lumora::Dictionary>;
-
-void require(bool holds, std::string_view condition, std::string_view operation) {
-  lumora::assertThat(holds, condition, operation, "LMRActionFactory");
-}
 
 lumora::Array flags(bool asynchronous, bool deleteAfterSubmission) {
   lumora::Array arguments;
@@ -34,8 +30,7 @@ OptionalText writtenUserMetadata(const OptionalMetadata& metadata) {
 }
 
 std::shared_ptr<LMRAction> submitAction(lumora::Array arguments, std::shared_ptr<LMRSession> session) {
-  auto action = LMRAction::actionWithCommand_arguments_session("submit", std::move(arguments), std::move(session));
-  action->setDescription(LMRLocalizedString("Submitting files\\U2026"));
+  auto action = lumora::toolAction("submit", std::move(arguments), std::move(session), "Submitting files\\U2026");
   action->setExpectXMLResponse(false);
   return action;
 }
@@ -58,12 +53,11 @@ std::shared_ptr<LMRAction> stopAction(const OptionalText& camera, const Optional
                                       lumora::Value destination, std::shared_ptr<LMRSession> session,
                                       std::string_view operation) {
   const auto metadataFilePath = writtenUserMetadata(userMetadata);
-  require(metadataFilePath.has_value(), "metadataFilePath != nil", operation);
+  requireForFactory(metadataFilePath.has_value(), "metadataFilePath != nil", operation);
   lumora::Array arguments{requestPair("stop", camera), requestPair("metadata", metadataFilePath),
                           std::move(destination)};
-  auto action = LMRAction::actionWithCommand_arguments_session(std::nullopt, std::move(arguments), std::move(session));
-  action->setDescription(LMRLocalizedString("Stopping and submitting remote camera recording\\U2026"));
-  return action;
+  return lumora::toolAction(std::nullopt, std::move(arguments), std::move(session),
+                            "Stopping and submitting remote camera recording\\U2026");
 }
 
 } // namespace
@@ -73,8 +67,8 @@ std::shared_ptr<LMRAction> LMRActionFactory::
         const OptionalText& file, const OptionalText& workflowName, const OptionalMetadata& userMetadata,
         const OptionalMetadata& recordingMetadata, bool asynchronous, bool deleteAfterSubmission,
         std::shared_ptr<LMRSession> session) {
-  require(file.has_value(), "file != nil", __func__);
-  require(workflowName.has_value(), "workflowName != nil", __func__);
+  requireForFactory(file.has_value(), "file != nil", __func__);
+  requireForFactory(workflowName.has_value(), "workflowName != nil", __func__);
   return submitAction(fileArguments(*file, userMetadata, recordingMetadata, flags(asynchronous, deleteAfterSubmission),
                                     requestPair("workflow", *workflowName)),
                       std::move(session));
@@ -85,8 +79,8 @@ std::shared_ptr<LMRAction> LMRActionFactory::
         const OptionalText& file, const OptionalText& submissionUUID, const OptionalMetadata& userMetadata,
         const OptionalMetadata& recordingMetadata, bool asynchronous, bool deleteAfterSubmission,
         std::shared_ptr<LMRSession> session) {
-  require(file.has_value(), "file != nil", __func__);
-  require(submissionUUID.has_value(), "submissionUUID != nil", __func__);
+  requireForFactory(file.has_value(), "file != nil", __func__);
+  requireForFactory(submissionUUID.has_value(), "submissionUUID != nil", __func__);
   return submitAction(fileArguments(*file, userMetadata, recordingMetadata, flags(asynchronous, deleteAfterSubmission),
                                     requestPair("submission_uuid", *submissionUUID)),
                       std::move(session));
@@ -96,8 +90,8 @@ std::shared_ptr<LMRAction>
 LMRActionFactory::actionToSubmitFiles_toWorkflow_metadata_asynchronous_deleteAfterSubmission_session(
     const std::vector<std::string>& files, const OptionalText& workflowName, const OptionalMetadata& userMetadata,
     bool asynchronous, bool deleteAfterSubmission, std::shared_ptr<LMRSession> session) {
-  require(!files.empty(), "[files count] > 0", __func__);
-  require(workflowName.has_value(), "workflowName != nil", __func__);
+  requireForFactory(!files.empty(), "[files count] > 0", __func__);
+  requireForFactory(workflowName.has_value(), "workflowName != nil", __func__);
   const auto metadataFilePath = writtenUserMetadata(userMetadata);
   const bool isLibraryServer = session && session->isLumoraLibraryServer();
   auto arguments = flags(asynchronous && !isLibraryServer, deleteAfterSubmission);
@@ -112,14 +106,14 @@ LMRActionFactory::actionToSubmitFiles_toWorkflow_metadata_asynchronous_deleteAft
 std::shared_ptr<LMRAction> LMRActionFactory::actionToStopRemoteCamera_andSubmitToWorkflow_withMetadata_session(
     const OptionalText& camera, const OptionalText& workflowName, const OptionalMetadata& userMetadata,
     std::shared_ptr<LMRSession> session) {
-  require(workflowName.has_value(), "workflowName != nil", __func__);
+  requireForFactory(workflowName.has_value(), "workflowName != nil", __func__);
   return stopAction(camera, userMetadata, requestPair("workflow", *workflowName), std::move(session), __func__);
 }
 
 std::shared_ptr<LMRAction> LMRActionFactory::actionToStopRemoteCamera_andSubmitToSubmissionUUID_withMetadata_session(
     const OptionalText& camera, const OptionalText& submissionUUID, const OptionalMetadata& userMetadata,
     std::shared_ptr<LMRSession> session) {
-  require(submissionUUID.has_value(), "submissionUUID != nil", __func__);
+  requireForFactory(submissionUUID.has_value(), "submissionUUID != nil", __func__);
   return stopAction(camera, userMetadata, requestPair("submission_uuid", *submissionUUID), std::move(session),
                     __func__);
 }
