@@ -28,12 +28,11 @@ std::optional<std::int64_t> integerValue(const Value& value) {
   return real && *real >= -limit && *real < limit ? std::optional(static_cast<std::int64_t>(*real)) : std::nullopt;
 }
 
-LMRErrorRef unusableStatus(const Value& status) {
-  const bool isCollection = status.array() || status.dictionary();
+// Without the status itself, which may be a text of any length.
+LMRErrorRef unusableStatus() {
   return LMRError::make(lumora::HelperAgentErrorDomain,
                         static_cast<std::int64_t>(lumora::HelperAgentError::MalformedReply),
-                        lumora::format("The helper agent replied with a status that is no number: %@",
-                                       {isCollection ? "a collection" : status.description()}));
+                        "The helper agent's reply cannot be read: its status is no usable number");
 }
 
 } // namespace
@@ -102,7 +101,7 @@ void LMRPrivilegedAction::take(const Dictionary& reply) {
   const Value* const statusValue = reply.find("terminationStatus");
   const auto status = statusValue ? integerValue(*statusValue) : 0;
   if (!status) {
-    return failWithoutReply(unusableStatus(*statusValue));
+    return failWithoutReply(unusableStatus());
   }
   if (*status != 0) {
     const auto standardError = reply.string("standardError");

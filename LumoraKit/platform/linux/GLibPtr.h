@@ -18,6 +18,8 @@ struct GLibRelease {
       g_variant_unref(object);
     } else if constexpr (std::same_as<T, GMainContext>) {
       g_main_context_unref(object);
+    } else if constexpr (std::same_as<T, GMainLoop>) {
+      g_main_loop_unref(object);
     } else if constexpr (std::same_as<T, GSource>) {
       g_source_destroy(object);
       g_source_unref(object);

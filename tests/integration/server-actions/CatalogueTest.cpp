@@ -2,6 +2,7 @@
 #include "Catalogue.h"
 
 #include "RecordingTool.h"
+#include "support/Sessions.h"
 #include "support/ToolArguments.h"
 #include "support/ValuePrinter.h"
 
@@ -17,29 +18,21 @@ using lumora::Array;
 using lumora::Dictionary;
 using lumora::Value;
 using lumora::tests::CatalogueEntry;
+using lumora::tests::kerberosSession;
 using lumora::tests::pair;
+using lumora::tests::passwordSession;
 using testing::IsEmpty;
 using testing::SizeIs;
 
 namespace {
 
-std::shared_ptr<LMRSession> sessionOfType(LMRAuthenticationType type) {
-  auto session = LMRSession::session();
-  session->setServer("lumora.example.org");
-  session->setPort(8443);
-  session->setUserName("alice");
-  session->setPassword("open sesame");
-  session->setAuthenticationType(type);
-  return session;
-}
-
 Array passwordLogin() {
-  return {pair("server", "lumora.example.org:8443"), pair("auth", "Password"), pair("user", "alice"),
+  return {pair("server", "lumora.example.org:8170"), pair("auth", "Password"), pair("user", "alice"),
           pair("pass", "open sesame")};
 }
 
 Array kerberosLogin() {
-  return {pair("server", "lumora.example.org:8443"), pair("auth", "Kerberos")};
+  return {pair("server", "lumora.example.org:8170"), pair("auth", "Kerberos")};
 }
 
 // The auxiliary tool is not told how the user authenticates.
@@ -100,11 +93,11 @@ class SessionCatalogueTest : public CatalogueTest {};
 class PrivilegedCatalogueTest : public CatalogueTest {};
 
 TEST_P(SessionCatalogueTest, sendsTheLoginAndTheWords_whenTheSessionIsByPassword) {
-  expectRequest(sessionOfType(LMRAuthenticationTypePassword), passwordLogin());
+  expectRequest(passwordSession(), passwordLogin());
 }
 
 TEST_P(SessionCatalogueTest, sendsNoUserAndNoPassword_whenTheSessionIsByKerberos) {
-  expectRequest(sessionOfType(LMRAuthenticationTypeSingleSignOn), kerberosLogin());
+  expectRequest(kerberosSession(), kerberosLogin());
 }
 
 TEST_P(ToolCatalogueTest, sendsTheWordsAlone_whenThereIsNoSession) {
@@ -112,7 +105,7 @@ TEST_P(ToolCatalogueTest, sendsTheWordsAlone_whenThereIsNoSession) {
 }
 
 TEST_P(ToolCatalogueTest, saysWhatItDoesAndWhatItExpects) {
-  const auto session = entry_.takesSession ? sessionOfType(LMRAuthenticationTypePassword) : nullptr;
+  const auto session = entry_.takesSession ? passwordSession() : nullptr;
   const auto action = entry_.make(session, nullptr);
   EXPECT_EQ(action->description(), entry_.progress);
   EXPECT_EQ(action->expectXMLResponse(), entry_.expectsReply);
@@ -122,7 +115,7 @@ TEST_P(ToolCatalogueTest, saysWhatItDoesAndWhatItExpects) {
 }
 
 TEST_P(PrivilegedCatalogueTest, callsTheHelperAgentAndRunsNoTool) {
-  const auto session = entry_.takesSession ? sessionOfType(LMRAuthenticationTypePassword) : nullptr;
+  const auto session = entry_.takesSession ? passwordSession() : nullptr;
   const auto action = entry_.make(session, &authorization_);
   action->runSynchronously();
   ASSERT_EQ(action->error(), nullptr);
@@ -134,7 +127,7 @@ TEST_P(PrivilegedCatalogueTest, callsTheHelperAgentAndRunsNoTool) {
   EXPECT_EQ(Value(call.command), entry_.words.front());
   Dictionary expected{{"subarguments", Array(entry_.words.begin() + 1, entry_.words.end())}};
   if (session) {
-    expected.set("server", "lumora.example.org:8443");
+    expected.set("server", "lumora.example.org:8170");
     expected.set("user", "alice");
     expected.set("pass", "open sesame");
   }
@@ -143,7 +136,7 @@ TEST_P(PrivilegedCatalogueTest, callsTheHelperAgentAndRunsNoTool) {
 }
 
 TEST_P(PrivilegedCatalogueTest, saysWhatItDoesAndWhatItExpects) {
-  const auto session = entry_.takesSession ? sessionOfType(LMRAuthenticationTypePassword) : nullptr;
+  const auto session = entry_.takesSession ? passwordSession() : nullptr;
   const auto action = entry_.make(session, &authorization_);
   EXPECT_NE(std::dynamic_pointer_cast<LMRPrivilegedAction>(action), nullptr);
   EXPECT_EQ(action->description(), entry_.progress);

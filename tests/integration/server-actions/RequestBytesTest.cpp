@@ -1,4 +1,5 @@
 #include "RecordingTool.h"
+#include "support/Sessions.h"
 #include "support/ToolArguments.h"
 
 #include <LumoraKit/actions/LMRActionFactory.h>
@@ -15,19 +16,12 @@ namespace {
 
 class RequestBytesTest : public lumora::tests::RecordingToolTest {
 protected:
-  RequestBytesTest() {
-    session_->setServer("lumora.example.org");
-    session_->setUserName("alice");
-    session_->setPassword("open sesame");
-    session_->setAuthenticationType(LMRAuthenticationTypePassword);
-  }
-
   std::string requestOf(const std::shared_ptr<LMRAction>& action) const {
     action->runSynchronously();
     return request();
   }
 
-  std::shared_ptr<LMRSession> session_ = LMRSession::session();
+  std::shared_ptr<LMRSession> session_ = lumora::tests::passwordSession();
 };
 
 TEST_F(RequestBytesTest, areServerAuthUserPassAndCommand_whenTheSessionIsByPassword) {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "support/Sessions.h"
 #include "support/ToolArguments.h"
 
 #include <LumoraKit/actions/LMRAction.h>
@@ -8,21 +9,6 @@
 #include <gtest/gtest.h>
 
 namespace lumora::tests {
-
-inline std::shared_ptr<LMRSession> passwordSession() {
-  auto session = LMRSession::session();
-  session->setServer("lumora.example.org");
-  session->setUserName("alice");
-  session->setPassword("open sesame");
-  session->setAuthenticationType(LMRAuthenticationTypePassword);
-  return session;
-}
-
-inline std::shared_ptr<LMRSession> kerberosSession() {
-  auto session = passwordSession();
-  session->setAuthenticationType(LMRAuthenticationTypeSingleSignOn);
-  return session;
-}
 
 /// Runs actions against a tool that answers from a script.
 class ServerActionTest : public testing::Test {
