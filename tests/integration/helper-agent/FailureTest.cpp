@@ -1,4 +1,5 @@
 #include "HelperAgentTest.h"
+#include "SilentSocket.h"
 #include "support/ValuePrinter.h"
 
 #include <gmock/gmock.h>
@@ -31,6 +32,15 @@ TEST_F(FailureTest, isThatThereIsNoBus_whenNobodyListens) {
 TEST_F(FailureTest, isThatThereIsNoBus_whenTheAddressIsNone) {
   ::setenv("DBUS_SYSTEM_BUS_ADDRESS", "no address", 1);
   expectFailure(perform("echo"), HelperAgentError::NoBus, "The system bus cannot be reached: ");
+}
+
+TEST_F(FailureTest, isThatThereIsNoBus_whenItNeverAnswersWithinTheDeadline) {
+  const lumora::tests::TemporaryFolder folder;
+  const std::string path = folder / "bus";
+  const lumora::tests::SilentSocket bus(path);
+  ::setenv("DBUS_SYSTEM_BUS_ADDRESS", ("unix:path=" + path).c_str(), 1);
+  lumora::backend::DBusHelperAgent impatient(std::chrono::milliseconds(200));
+  expectFailure(perform(impatient, "echo", {}, nullptr), HelperAgentError::NoBus, "The system bus cannot be reached: ");
 }
 
 TEST_F(FailureTest, isThatThereIsNoAgent_whenNobodyServes) {
