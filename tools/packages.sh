@@ -17,7 +17,7 @@ run_packages=(
 headless_packages=(dbus pipewire pipewire-bin pipewire-pulse wireplumber libspa-0.2-modules xvfb)
 
 demo_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
-test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
+test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg polkitd)
 bench_packages=(libbenchmark-dev gstreamer1.0-tools bsdextrautils)
 lint_packages=(clang-14 clang-tidy-14 clang-format-14 libclang-rt-14-dev git python3)
 

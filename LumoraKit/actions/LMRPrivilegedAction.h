@@ -15,16 +15,14 @@ inline constexpr std::string_view LMRHelperAgentIdentifier = "org.vantor.lumagen
 ///
 /// The request to the agent is a dictionary: "subarguments" (the arguments), and with a session "server" ("host:port"),
 /// "user" and "pass". The reply is one of "terminationStatus" (number), "standardError" (string) and "standardOutput"
-/// (string, an XML property list):
-///
-/// | The agent's answer | The action |
-/// |---|---|
-/// | no reply, or an error | fails with that error (domain lumora::HelperAgentErrorDomain) |
-/// | no reply and no error | succeeds without a result |
-/// | a status other than 0 | fails as errorForStatusCode_standardError() says; a standard error that is no string
-/// counts as absent | | a status that is no number, or none that 64 bits hold | fails with
-/// lumora::HelperAgentError::MalformedReply | | no status, or 0 | succeeds; the result is the dictionary in the
-/// standard output, empty without a standard output, null when that is no property list |
+/// (string, an XML property list). The agent's answer decides:
+///   - no reply, or an error: the action fails with that error, of the domain lumora::HelperAgentErrorDomain;
+///   - neither: it succeeds without a result;
+///   - a status other than 0: it fails as errorForStatusCode_standardError() says, where a standard error that is no
+///     string counts as absent;
+///   - a status that is no number, or none that 64 bits hold: it fails with lumora::HelperAgentError::MalformedReply;
+///   - no status, or 0: it succeeds. The result is the dictionary in the standard output: empty without an output, null
+///     when that is no property list.
 ///
 /// A status with a fraction counts without it. Failures are logged. Whether a reply is expected
 /// (expectXMLResponse()) does not matter.

@@ -10,9 +10,9 @@ std::shared_ptr<LMRToolAction> LMRToolAction::actionWithCommand_arguments_sessio
   return std::make_shared<LMRToolAction>(std::move(command), std::move(arguments), std::move(session));
 }
 
-// NOLINTNEXTLINE(performance-unnecessary-value-param): as in the class it is inherited from
-std::shared_ptr<LMRToolAction> LMRToolAction::actionWithCommand_arguments(std::optional<std::string> /*command*/,
-                                                                          std::optional<lumora::Array> /*arguments*/) {
+std::shared_ptr<LMRToolAction>
+LMRToolAction::actionWithCommand_arguments(const std::optional<std::string>& /*command*/,
+                                           const std::optional<lumora::Array>& /*arguments*/) {
   lumora::log("WARNING: %@ tried to create a LMRToolAction without a server session",
               {lumora::Platform::current().application->identifier()});
   return nullptr;

@@ -13,8 +13,8 @@ public:
                                                                             std::optional<lumora::Array> arguments,
                                                                             std::shared_ptr<LMRSession> session);
   /// Refuses, because there is no session: writes a warning to the log and returns null.
-  static std::shared_ptr<LMRToolAction> actionWithCommand_arguments(std::optional<std::string> command,
-                                                                    std::optional<lumora::Array> arguments);
+  static std::shared_ptr<LMRToolAction> actionWithCommand_arguments(const std::optional<std::string>& command,
+                                                                    const std::optional<lumora::Array>& arguments);
 
   LMRToolAction(std::optional<std::string> command, std::optional<lumora::Array> arguments,
                 std::shared_ptr<LMRSession> session);

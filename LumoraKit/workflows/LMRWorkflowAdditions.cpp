@@ -1,6 +1,7 @@
 #include <LumoraKit/workflows/LMRWorkflowAdditions.h>
 #include <LumoraKit/workflows/LMRWorkflowAdditionsInternal.h>
 
+#include <algorithm>
 #include <initializer_list>
 
 namespace Internal = LMRWorkflowAdditionsInternal;
@@ -14,12 +15,9 @@ constexpr std::string_view file = "File";
 
 bool supportsAny(const lumora::Dictionary& workflow, std::int64_t index,
                  std::initializer_list<std::string_view> sourceTypes) {
-  for (const auto sourceType : sourceTypes) {
-    if (Internal::supportsSourceType_forSourceAtIndex(workflow, sourceType, index)) {
-      return true;
-    }
-  }
-  return false;
+  return std::ranges::any_of(sourceTypes, [&workflow, index](std::string_view sourceType) {
+    return Internal::supportsSourceType_forSourceAtIndex(workflow, sourceType, index);
+  });
 }
 
 LMRWorkflowType singleSourceType(const lumora::Dictionary& workflow) {

@@ -9,7 +9,7 @@ namespace {
 
 // A flag that is true, or a number equal to it. A text is neither.
 bool isTrue(const lumora::Value* flag) {
-  return flag && flag->real() == 1.0;
+  return flag != nullptr && flag->real() == 1.0;
 }
 
 } // namespace
@@ -31,9 +31,9 @@ bool supportsSourceType_forSourceAtIndex(const lumora::Dictionary& workflow, std
                      "LMRWorkflowAdditions");
   const auto* const source = (*sources(workflow))[static_cast<std::size_t>(index)].dictionary();
   const auto* const sourceTypes = source ? source->array("sourceTypes") : nullptr;
-  return sourceTypes && std::ranges::any_of(*sourceTypes, [sourceType](const lumora::Value& supported) {
+  return sourceTypes != nullptr && std::ranges::any_of(*sourceTypes, [sourceType](const lumora::Value& supported) {
            const std::string* const word = supported.string();
-           return word && *word == sourceType;
+           return word != nullptr && *word == sourceType;
          });
 }
 
@@ -44,9 +44,9 @@ bool singleSourceAndSupportsSourceType(const lumora::Dictionary& workflow, std::
 
 bool anySourceRequiresFolderSubmission(const lumora::Dictionary& workflow) {
   const lumora::Array* const all = sources(workflow);
-  return all && std::ranges::any_of(*all, [](const lumora::Value& source) {
+  return all != nullptr && std::ranges::any_of(*all, [](const lumora::Value& source) {
            const lumora::Dictionary* const description = source.dictionary();
-           return description && isTrue(description->find("isFolder"));
+           return description != nullptr && isTrue(description->find("isFolder"));
          });
 }
 

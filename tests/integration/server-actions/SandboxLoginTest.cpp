@@ -12,6 +12,7 @@
 
 using lumora::Dictionary;
 using lumora::tests::SandboxServer;
+using testing::HasSubstr;
 using testing::IsEmpty;
 using testing::Not;
 using testing::SizeIs;
@@ -56,6 +57,22 @@ TEST_F(SandboxLoginTest, failsAsNotAuthorized_whenThePasswordIsWrong) {
   ASSERT_TRUE(action->error());
   EXPECT_EQ(action->error()->code(), 26);
   EXPECT_EQ(action->session(), nullptr);
+}
+
+TEST_F(SandboxLoginTest, failsWithTheToolsReason_whenTheFileIsMissingOrCannotBeRead) {
+  const auto session = login(SandboxServer::password)->session();
+  ASSERT_TRUE(session);
+  for (const auto& path : {server_.folder() / "missing.mov", server_.folder()}) {
+    const auto action = LMRActionFactory::
+        actionToSubmitFile_toWorkflow_userMetadata_recordingMetadata_asynchronous_deleteAfterSubmission_session(
+            path.string(), "single-video", Dictionary{{"Title", "Lecture 1"}}, std::nullopt, false, false, session);
+    action->runSynchronously();
+    ASSERT_TRUE(action->error());
+    EXPECT_EQ(action->error()->code(), 33);
+    EXPECT_EQ(action->error()->localizedDescription(), "File copy failed");
+    EXPECT_THAT(action->error()->userInfo().string("stderr").value_or(""), HasSubstr(path.filename().string()));
+  }
+  EXPECT_THAT(server_.episodes(), IsEmpty());
 }
 
 TEST_F(SandboxLoginTest, submitsAFile_whenLoggedIn) {

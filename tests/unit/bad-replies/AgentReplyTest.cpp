@@ -23,7 +23,7 @@ protected:
   }
 
   lumora::fakes::FakePlatform platform_;
-  const lumora::Authorization authorization_;
+  const lumora::Authorization authorization_{};
 };
 
 TEST_P(AgentReplyTest, statusIsANumber_orTheReplyIsMalformed) {

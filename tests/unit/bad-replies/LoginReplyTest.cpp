@@ -5,7 +5,6 @@
 #include <LumoraKit/testing/FakePlatform.h>
 
 using lumora::Dictionary;
-using lumora::Value;
 using lumora::fakes::ToolReply;
 using lumora::tests::FieldValue;
 

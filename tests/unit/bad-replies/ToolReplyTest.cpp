@@ -76,7 +76,7 @@ TEST_P(WritableNameTest, reachesTheAuxiliaryToolUnchanged) {
 }
 
 TEST_P(WritableNameTest, reachesTheHelperAgentUnchanged) {
-  const lumora::Authorization authorization;
+  const lumora::Authorization authorization{};
   Factory::actionToBindCamera_session_authorization(name(), passwordSession(), &authorization)->runSynchronously();
   ASSERT_EQ(platform_.helperAgent->callCount(), 1U);
   EXPECT_TRUE(*platform_.helperAgent->calls()[0].request.array("subarguments") == Array{name()});

@@ -5,7 +5,6 @@
 
 using lumora::Array;
 using lumora::Dictionary;
-using lumora::Value;
 using lumora::tests::FieldValue;
 using namespace LMRWorkflowAdditions;
 

@@ -11,7 +11,7 @@ class FactoryDeathTest : public testing::Test {
 protected:
   FactoryDeathTest() { GTEST_FLAG_SET(death_test_style, "threadsafe"); }
 
-  const lumora::Authorization authorization_;
+  const lumora::Authorization authorization_{};
 };
 
 TEST_F(FactoryDeathTest, bindStopsTheProcess_whenThereIsNoSession) {

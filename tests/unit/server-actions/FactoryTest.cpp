@@ -60,7 +60,7 @@ TEST_F(FactoryTest, install_sendsPathAndOverwrite_whenThereIsNoPassword) {
 }
 
 TEST_F(FactoryTest, setConfiguration_sendsOneBareWord) {
-  const lumora::Authorization authorization;
+  const lumora::Authorization authorization{};
   const auto action = LMRActionFactory::actionToSetRemoteRecorderConfigurationValue_forKey_authorization(
       "a=b %@", std::string(LMRRemoteRecorderQualityDeviceKey), &authorization);
   EXPECT_THAT(*action->arguments(), ElementsAre("Capture=a=b %@"));
@@ -91,7 +91,7 @@ TEST_F(FactoryTest, pairEndsAtItsKey_whenAWordIsAbsent) {
 }
 
 TEST_F(FactoryTest, bind_sendsNoWord_whenTheNameIsAbsent) {
-  const lumora::Authorization authorization;
+  const lumora::Authorization authorization{};
   const auto action =
       LMRActionFactory::actionToBindCamera_session_authorization(std::nullopt, passwordSession(), &authorization);
   EXPECT_EQ(action->arguments(), lumora::Array());
