@@ -138,19 +138,28 @@ GLibPtr<GVariant> DBusHelperAgent::exchange(const Message& message, LMRErrorRef*
   return answer;
 }
 
-// Connects under the lock, so that several first calls share one connection.
 std::shared_ptr<DBusLink> DBusHelperAgent::link(DBusOperation& operation, LMRErrorRef* error) {
-  const std::lock_guard lock(mutex_);
-  if (link_ && link_->isOpen()) {
-    return link_;
+  if (auto open = sharedLink(nullptr)) {
+    return open;
   }
   GError* noAddress = nullptr;
   const GLibPtr<gchar> address(g_dbus_address_get_for_bus_sync(G_BUS_TYPE_SYSTEM, nullptr, &noAddress));
   GLibPtr<GError> reason(noAddress);
-  link_ = address ? operation.connect(address.get(), reason) : nullptr;
-  if (!link_) {
+  auto connected = address ? operation.connect(address.get(), reason) : nullptr;
+  if (!connected) {
     set(error,
         helperAgentError(HelperAgentError::NoBus, format("The system bus cannot be reached: %@", {reason->message})));
+    return nullptr;
+  }
+  return sharedLink(std::move(connected));
+}
+
+// Of several first calls the quickest one's connection is used by all: nobody connects under the lock, where others
+// would wait past their own deadlines.
+std::shared_ptr<DBusLink> DBusHelperAgent::sharedLink(std::shared_ptr<DBusLink> replacement) {
+  const std::lock_guard lock(mutex_);
+  if (!link_ || !link_->isOpen()) {
+    link_.swap(replacement);
   }
   return link_;
 }

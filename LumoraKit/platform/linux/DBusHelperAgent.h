@@ -38,6 +38,8 @@ private:
 
   GLibPtr<GVariant> exchange(const Message& message, LMRErrorRef* error);
   std::shared_ptr<DBusLink> link(DBusOperation& operation, LMRErrorRef* error);
+  /// The open connection; when there is none the replacement, which may be null.
+  std::shared_ptr<DBusLink> sharedLink(std::shared_ptr<DBusLink> replacement);
 
   const std::chrono::milliseconds deadline_;
   std::mutex mutex_;

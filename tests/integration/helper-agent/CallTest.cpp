@@ -8,7 +8,9 @@
 
 #include <gmock/gmock.h>
 
+#include <array>
 #include <thread>
+#include <vector>
 
 using lumora::Array;
 using lumora::Dictionary;
@@ -39,6 +41,19 @@ TEST_F(CallTest, bringsEachThreadItsOwnReply_whenManyCallAtOnce) {
   }
   for (std::size_t index = 0; index < replies.size(); ++index) {
     EXPECT_EQ(replies.at(index), (Dictionary{{"index", std::uint64_t{index}}}));
+  }
+}
+
+TEST_F(CallTest, shareOneConnection_whenTheFirstOnesComeAtOnce) {
+  std::array<std::optional<Dictionary>, 16> replies;
+  {
+    std::vector<std::jthread> threads;
+    for (auto& reply : replies) {
+      threads.emplace_back([&] { reply = perform("echo").reply; });
+    }
+  }
+  for (const auto& reply : replies) {
+    EXPECT_EQ(reply, Dictionary());
   }
 }
 
