@@ -1,12 +1,10 @@
 #include "Tool.h"
 
 #include "Status.h"
+#include "Strike.h"
 #include "commands/Command.h"
-#include "store/Faults.h"
 
 #include <LumoraKit/platform/PropertyList.h>
-
-#include <thread>
 
 #include <unistd.h>
 
@@ -16,34 +14,15 @@ namespace {
 
 constexpr const char* garbage = "<html><body>502 Bad Gateway</body>";
 
-[[noreturn]] void hang() {
-  for (;;) {
-    pause();
+/// The outcome of a command with its reply, as far as the faults leave it.
+Outcome outcomeOf(const Dictionary& reply, const Damage& damage) {
+  Outcome outcome;
+  outcome.standardOutput = damage.reply == Damage::Reply::Garbage ? garbage : xmlDescription(reply).value();
+  if (damage.reply == Damage::Reply::Half) {
+    outcome.standardOutput.resize(outcome.standardOutput.size() / 2);
+    outcome.status = damage.status;
   }
-}
-
-/// Lets a fault strike before the command runs. True when the reply is to be spoilt.
-bool strike(const Fault& fault) {
-  switch (fault.kind) {
-  case Fault::Kind::Latency:
-    std::this_thread::sleep_for(std::chrono::milliseconds(fault.value));
-    return false;
-  case Fault::Kind::Failure:
-    throw Refusal(static_cast<Status>(fault.value), fault.message.value_or("the failure that was asked for"));
-  case Fault::Kind::Hang:
-    hang();
-  case Fault::Kind::Garbage:
-    return true;
-  }
-  return false;
-}
-
-bool strikeAll(Store& store, const std::string& command) {
-  bool isSpoilt = false;
-  for (const auto& fault : takeFaults(store, command)) {
-    isSpoilt = strike(fault) || isSpoilt;
-  }
-  return isSpoilt;
+  return outcome;
 }
 
 /// Single sign-on is always the one user that the server was set up with; there is no ticket to be checked.
@@ -73,6 +52,13 @@ void checkLogin(const Command& command, const Call& call) {
   }
 }
 
+/// The helper agent's exec tool acts as the superuser. It may: only the owner of the state can open it.
+void checkPrivilege(const Command& command, ToolKind tool) {
+  if (command.isPrivileged && tool != ToolKind::Exec && geteuid() != 0) {
+    throw Refusal(Status::NotRoot, "\"" + std::string(command.word) + "\" is for the superuser");
+  }
+}
+
 Outcome answerOrThrow(ToolKind tool, const std::filesystem::path& root, const std::string& request) {
   const auto elements = parseRequest(request);
   const Call call = parseCall(elements, tool);
@@ -81,14 +67,14 @@ Outcome answerOrThrow(ToolKind tool, const std::filesystem::path& root, const st
   const Arguments arguments = match(command.grammar, call.arguments);
 
   Store store = Store::open(root);
-  const bool isSpoilt = strikeAll(store, call.command);
-  Context context{store, std::nullopt, {}};
+  checkPrivilege(command, tool);
+  const Damage damage = strike(store, call.command);
+  Context context{store, std::nullopt, {}, {}};
   if (call.credentials) {
     context.user = logIn(store, *call.credentials);
+    context.host = call.credentials->server.host;
   }
-  const Dictionary reply = command.run(context, arguments);
-
-  Outcome outcome{0, isSpoilt ? garbage : xmlDescription(reply).value(), {}};
+  Outcome outcome = outcomeOf(command.run(context, arguments), damage);
   for (const auto& remark : context.remarks) {
     outcome.standardError += remark + "\n";
   }

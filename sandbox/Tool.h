@@ -3,13 +3,15 @@
 #include "protocol/Call.h"
 
 #include <filesystem>
+#include <optional>
 #include <string>
 
 namespace lumora::sandbox {
 
 /// How a tool ends.
 struct Outcome {
-  int status = 0;
+  /// The exit status; absent when the tool is not to end.
+  std::optional<int> status = 0;
   std::string standardOutput;
   std::string standardError;
 };

@@ -1,6 +1,7 @@
 #include "ToolProgram.h"
 
 #include "Status.h"
+#include "Strike.h"
 #include "Tool.h"
 
 #include <csignal>
@@ -32,7 +33,10 @@ int answerStandardInput(const Invocation& invocation) {
     std::cerr << invocation.name << ": " << outcome.standardError;
   }
   std::cout << outcome.standardOutput << std::flush;
-  return std::cout ? outcome.status : fail(invocation.name, Status::UnknownServerError, "the reply cannot be written");
+  if (!outcome.status) {
+    hang();
+  }
+  return std::cout ? *outcome.status : fail(invocation.name, Status::UnknownServerError, "the reply cannot be written");
 }
 
 } // namespace

@@ -47,6 +47,8 @@ int administrate(int argc, char** argv) {
   addCreateCommand(program);
   addUserCommands(program);
   addWorkflowCommands(program);
+  addCameraCommands(program);
+  addMasterPasswordCommand(program);
   addEpisodesCommand(program);
   addInjectCommand(program);
   try {

@@ -12,6 +12,8 @@ namespace lumora::sandbox {
 void addCreateCommand(CLI::App& program);
 void addUserCommands(CLI::App& program);
 void addWorkflowCommands(CLI::App& program);
+void addCameraCommands(CLI::App& program);
+void addMasterPasswordCommand(CLI::App& program);
 void addEpisodesCommand(CLI::App& program);
 void addInjectCommand(CLI::App& program);
 

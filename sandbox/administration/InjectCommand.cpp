@@ -2,6 +2,7 @@
 #include "../store/Faults.h"
 #include "Commands.h"
 
+#include <csignal>
 #include <iostream>
 #include <memory>
 #include <set>
@@ -15,6 +16,7 @@ struct Options {
   std::string command = "*";
   std::int64_t latency = 0;
   std::int64_t status = 0;
+  std::int64_t signal = SIGSEGV;
   std::string message;
   std::int64_t times = 0;
 };
@@ -45,9 +47,17 @@ void clear(const Options& options) {
   clearFaults(store);
 }
 
+/// What a transfer that nobody waits for can meet: one that hung would stay for ever.
+bool strikesTransfers(const std::string& kind) {
+  return kind == "latency" || kind == "failure" || kind == "crash";
+}
+
 /// A fault for a mistyped command would never strike.
-std::set<std::string> commandNames() {
+std::set<std::string> commandNames(const std::string& kind) {
   std::set<std::string> names{"*"};
+  if (strikesTransfers(kind)) {
+    names.emplace(transferName);
+  }
   for (const auto tool : {ToolKind::Main, ToolKind::Action}) {
     for (const auto& command : commandsOf(tool)) {
       names.emplace(command.word);
@@ -60,8 +70,10 @@ CLI::App& addKind(CLI::App& group, const std::string& name, const std::string& t
                   const std::shared_ptr<Options>& options) {
   auto& command = *group.add_subcommand(name, text);
   addRootArgument(command, options->root);
-  command.add_option("--command", options->command, "command that it strikes; * is every command")
-      ->check(CLI::IsMember(commandNames()).description(""))
+  command
+      .add_option("--command", options->command,
+                  "command that it strikes, * for every one; for latency, failure and crash also transfer")
+      ->check(CLI::IsMember(commandNames(name)).description(""))
       ->capture_default_str();
   command.add_option("--times", options->times, "how many runs it strikes; without it every one")
       ->check(CLI::PositiveNumber);
@@ -76,6 +88,26 @@ void addFailure(CLI::App& group, const std::shared_ptr<Options>& options) {
   failure.callback([options] { inject(*options, Fault::Kind::Failure, options->status); });
 }
 
+void addCrash(CLI::App& group, const std::shared_ptr<Options>& options) {
+  auto& crash = addKind(group, "crash", "Die of a signal", options);
+  crash.add_option("--signal", options->signal, "number of the signal")
+      ->check(CLI::Range(1, SIGRTMIN - 1))
+      ->capture_default_str();
+  crash.callback([options] { inject(*options, Fault::Kind::Crash, options->signal); });
+}
+
+void addHalfReplies(CLI::App& group, const std::shared_ptr<Options>& options) {
+  constexpr int highestStatus = 255;
+  auto& partial = addKind(group, "partial", "Do the work, write half of the reply and end", options);
+  partial.add_option("--status", options->status, "exit status")
+      ->check(CLI::Range(0, highestStatus))
+      ->capture_default_str();
+  partial.callback([options] { inject(*options, Fault::Kind::Partial, options->status); });
+  addKind(group, "stall", "Do the work, write half of the reply and never end", options).callback([options] {
+    inject(*options, Fault::Kind::Stall, 0);
+  });
+}
+
 } // namespace
 
 void addInjectCommand(CLI::App& program) {
@@ -87,9 +119,11 @@ void addInjectCommand(CLI::App& program) {
   latency.callback([options] { inject(*options, Fault::Kind::Latency, options->latency); });
 
   addFailure(group, options);
+  addCrash(group, options);
   addKind(group, "garbage", "Do the work, but reply with what is no property list", options).callback([options] {
     inject(*options, Fault::Kind::Garbage, 0);
   });
+  addHalfReplies(group, options);
   addKind(group, "hang", "Never answer", options).callback([options] { inject(*options, Fault::Kind::Hang, 0); });
 
   auto& listing = *group.add_subcommand("list", "List the faults: number, command, kind, value, times, message");

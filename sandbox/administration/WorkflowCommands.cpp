@@ -20,7 +20,7 @@ struct Options {
 WorkflowSource sourceFrom(const std::string& types, bool isFolder) {
   WorkflowSource source{CLI::detail::split(types, ','), isFolder};
   for (const auto& type : source.types) {
-    if (type != "Video" && type != "Screen" && type != "Audio" && type != "File") {
+    if (!isSourceType(type)) {
       throw std::runtime_error("\"" + type + "\" is not a source type (Video, Screen, Audio, File)");
     }
   }
@@ -28,7 +28,7 @@ WorkflowSource sourceFrom(const std::string& types, bool isFolder) {
 }
 
 void add(const Options& options) {
-  Workflow workflow{"", options.name, options.title.empty() ? options.name : options.title, {}};
+  Workflow workflow{"", options.name, options.title.empty() ? options.name : options.title, {}, false};
   for (const auto& types : options.sources) {
     workflow.sources.push_back(sourceFrom(types, options.isFolder));
   }

@@ -31,9 +31,14 @@ Argument word(std::string_view key, Count count = Count::Optional) {
   return {Form::Word, key, count};
 }
 
-Command verb(std::string_view name, Grammar rest) {
+Command verb(std::string_view name, Grammar rest, decltype(Command::run) run) {
   rest.insert(rest.begin(), text(name));
-  return {name, Login::Required, std::move(rest), cameraVerb, true};
+  return {name, Login::Required, std::move(rest), run, true};
+}
+
+/// For the superuser, with one word.
+Command privileged(std::string_view name, Login login, std::string_view object, decltype(Command::run) run) {
+  return {name, login, {{Form::AnyWord, object}}, run, false, true};
 }
 
 const std::vector<Command>& mainCommands() {
@@ -44,9 +49,9 @@ const std::vector<Command>& mainCommands() {
       {"installworkflow",
        Login::Required,
        {text("path"), text("master_password", Count::Optional), word("overwrite")},
-       notServed},
-      {"downloadworkflow", Login::Required, {text("workflow_uuid"), text("path")}, notServed},
-      {"deleteworkflow", Login::Required, {text("workflow_uuid")}, notServed},
+       installWorkflow},
+      {"downloadworkflow", Login::Required, {text("workflow_uuid"), text("path")}, downloadWorkflow},
+      {"deleteworkflow", Login::Required, {text("workflow_uuid")}, deleteWorkflow},
       {"create_recording", Login::Required, {text("workflow_uuid")}, createRecordingContainer},
       {"submit",
        Login::Required,
@@ -56,17 +61,17 @@ const std::vector<Command>& mainCommands() {
       {"list_uploads", Login::None, {}, listUploads},
       {"clear_completed_uploads", Login::None, {}, clearCompletedUploads},
       {"listcameras", Login::Required, {}, listCameras},
-      verb("status", {word("update_preview_image"), word("include_preview_image")}),
-      verb("start", {{Form::Number, "delay"}, word("audio_only")}),
-      verb("pause", {}),
-      verb("resume", {}),
-      verb("cancel", {}),
-      verb("stop", {text("metadata"), either("workflow", "submission_uuid")}),
+      verb("status", {word("update_preview_image"), word("include_preview_image")}, cameraStatus),
+      verb("start", {{Form::Number, "delay"}, word("audio_only")}, startCamera),
+      verb("pause", {}, pauseCamera),
+      verb("resume", {}, resumeCamera),
+      verb("cancel", {}, cancelCamera),
+      verb("stop", {text("metadata"), either("workflow", "submission_uuid")}, stopCamera),
       {"isbound", Login::None, {word("plist", Count::One)}, isBound},
       {"getconfig", Login::None, {word("plist", Count::One)}, getConfiguration},
-      {"setconfig", Login::None, {{Form::AnyWord, "key and value"}}, notServed},
-      {"bind", Login::Required, {{Form::AnyWord, "camera"}}, notServed},
-      {"unbind", Login::Required, {{Form::AnyWord, "camera"}}, notServed},
+      privileged("setconfig", Login::None, "key and value", setConfiguration),
+      privileged("bind", Login::Required, "camera", bindCamera),
+      privileged("unbind", Login::Required, "camera", unbindCamera),
   };
   return commands;
 }

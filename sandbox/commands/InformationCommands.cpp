@@ -1,6 +1,4 @@
-#include "../Status.h"
 #include "../store/Recordings.h"
-#include "../store/Workflows.h"
 #include "Command.h"
 
 #include <sstream>
@@ -16,14 +14,6 @@ Array words(const std::string& text) {
     all.emplace_back(word);
   }
   return all;
-}
-
-Workflow workflowWithUUID(Store& store, const std::string& uuid) {
-  const auto workflow = findWorkflow(store, uuid);
-  if (!workflow || workflow->uuid != uuid) {
-    throw Refusal(Status::InvalidArguments, "there is no workflow with the UUID \"" + uuid + "\"");
-  }
-  return *workflow;
 }
 
 } // namespace
@@ -51,10 +41,6 @@ Dictionary listWorkflows(Context& context, const Arguments&) {
           {"user_shortname", context.user->name},
           {"user_fullname", context.user->fullName},
           {"server", context.store.setting("server_kind", "LumoraServer")}};
-}
-
-Dictionary infoWorkflow(Context& context, const Arguments& arguments) {
-  return description(workflowWithUUID(context.store, arguments.text("workflow_uuid")));
 }
 
 Dictionary createRecordingContainer(Context& context, const Arguments& arguments) {

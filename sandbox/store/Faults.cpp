@@ -1,12 +1,14 @@
 #include "Faults.h"
 
+#include <algorithm>
 #include <array>
 
 namespace lumora::sandbox {
 
 namespace {
 
-constexpr std::array<std::string_view, 4> kindNames{"latency", "failure", "garbage", "hang"};
+constexpr std::array<std::string_view, 7> kindNames{"latency", "failure", "garbage", "hang",
+                                                    "crash",   "partial", "stall"};
 
 Fault::Kind kindNamed(const std::string& name) {
   std::size_t index = 0;
@@ -31,8 +33,12 @@ std::vector<Fault> faultsFrom(SQLite::Statement row) {
 
 std::vector<Fault> faultsFor(Store& store, const std::string& command) {
   return faultsFrom(store.query("SELECT id, command, kind, value, message, remaining FROM faults "
-                                "WHERE command IN (?, '*') ORDER BY id",
-                                command));
+                                "WHERE command = ?1 OR command = '*' AND ?1 <> ?2 ORDER BY id",
+                                command, std::string(transferName)));
+}
+
+bool isCounted(const Fault& fault) {
+  return fault.remaining.has_value();
 }
 
 } // namespace
@@ -55,9 +61,9 @@ std::vector<Fault> faults(Store& store) {
 }
 
 std::vector<Fault> takeFaults(Store& store, const std::string& command) {
-  // Nearly always there are none; only then is no write lock taken.
+  // No write lock is taken where nothing is counted: many runs at once would wait for one another.
   auto struck = faultsFor(store, command);
-  if (struck.empty()) {
+  if (std::none_of(struck.begin(), struck.end(), isCounted)) {
     return struck;
   }
   store.change([&] {

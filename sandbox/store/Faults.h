@@ -19,10 +19,16 @@ struct Fault {
     Garbage,
     /// Never answers.
     Hang,
+    /// Dies of the signal `value`.
+    Crash,
+    /// Does its work, writes half of the reply and ends with the status `value`.
+    Partial,
+    /// Does its work, writes half of the reply and never ends.
+    Stall,
   };
 
   std::int64_t id = 0;
-  /// The command word, or "*" for every command.
+  /// The command word, or "*" for every command; or `transferName`.
   std::string command;
   Kind kind = Kind::Failure;
   std::int64_t value = 0;
@@ -30,6 +36,9 @@ struct Fault {
   /// How many more runs it strikes; absent: every one.
   std::optional<std::int64_t> remaining;
 };
+
+/// Stands for the transfer that goes on when the tool of an asynchronous submission has ended; "*" does not.
+constexpr const char* transferName = "transfer";
 
 std::string_view nameOf(Fault::Kind kind);
 

@@ -1,5 +1,6 @@
 #include "Store.h"
 
+#include <chrono>
 #include <ctime>
 #include <stdexcept>
 
@@ -10,14 +11,15 @@ namespace fs = std::filesystem;
 namespace {
 
 constexpr int busyTimeout = 60'000; // milliseconds
-constexpr int schemaVersion = 1;
+constexpr int schemaVersion = 2;
 
 constexpr const char* schema = R"sql(
 CREATE TABLE settings (key TEXT PRIMARY KEY, value TEXT NOT NULL);
 CREATE TABLE users (
   name TEXT PRIMARY KEY, full_name TEXT NOT NULL, password_hash TEXT NOT NULL);
 CREATE TABLE workflows (
-  uuid TEXT PRIMARY KEY, name TEXT NOT NULL UNIQUE, title TEXT NOT NULL, sources TEXT NOT NULL, added INTEGER NOT NULL);
+  uuid TEXT PRIMARY KEY, name TEXT NOT NULL UNIQUE, title TEXT NOT NULL, sources TEXT NOT NULL,
+  is_protected INTEGER NOT NULL, added INTEGER NOT NULL);
 CREATE TABLE recordings (
   uuid TEXT PRIMARY KEY, workflow_uuid TEXT NOT NULL, workflow_name TEXT NOT NULL, user TEXT NOT NULL,
   created INTEGER NOT NULL);
@@ -33,6 +35,10 @@ CREATE TABLE files (
 CREATE TABLE uploads (
   uuid TEXT PRIMARY KEY, title TEXT NOT NULL, workflow_name TEXT NOT NULL, user TEXT NOT NULL, file_count INTEGER NOT NULL,
   size INTEGER NOT NULL, state TEXT NOT NULL, message TEXT, started INTEGER NOT NULL, ended INTEGER);
+CREATE TABLE cameras (
+  name TEXT PRIMARY KEY, uuid TEXT NOT NULL, is_bound INTEGER NOT NULL, take TEXT, user TEXT, audio_only INTEGER,
+  begins INTEGER, since INTEGER, recorded INTEGER);
+CREATE TABLE configuration (key TEXT PRIMARY KEY, value TEXT NOT NULL);
 CREATE TABLE faults (
   id INTEGER PRIMARY KEY AUTOINCREMENT, command TEXT NOT NULL, kind TEXT NOT NULL, value INTEGER NOT NULL,
   message TEXT, remaining INTEGER);
@@ -69,6 +75,7 @@ Store Store::create(const fs::path& root) {
   Store store(fs::absolute(root));
   fs::create_directories(store.submissionsFolder());
   fs::create_directories(store.incomingFolder());
+  fs::create_directories(store.previewsFolder());
   fs::permissions(stateFolder(store.root_), fs::perms::owner_all);
   store.database_ = openDatabase(store.root_, SQLite::OPEN_READWRITE | SQLite::OPEN_CREATE);
   store.database_->exec("PRAGMA journal_mode = WAL");
@@ -105,6 +112,10 @@ fs::path Store::incomingFolder() const {
   return stateFolder(root_) / "incoming";
 }
 
+fs::path Store::previewsFolder() const {
+  return stateFolder(root_) / "previews";
+}
+
 void Store::change(const std::function<void()>& change) {
   // Immediate: a transaction that reads first and writes later could not wait for another writer.
   SQLite::Transaction transaction(*database_, SQLite::TransactionBehavior::IMMEDIATE);
@@ -135,6 +146,11 @@ std::optional<std::int64_t> optionalNumber(const SQLite::Column& column) {
 
 std::int64_t currentTime() {
   return std::time(nullptr);
+}
+
+std::int64_t currentMilliseconds() {
+  using namespace std::chrono;
+  return duration_cast<milliseconds>(system_clock::now().time_since_epoch()).count();
 }
 
 } // namespace lumora::sandbox

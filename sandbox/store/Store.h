@@ -27,6 +27,8 @@ public:
   std::filesystem::path submissionsFolder() const;
   /// Where files are copied to before they are filed.
   std::filesystem::path incomingFolder() const;
+  /// Where the cameras' preview images lie.
+  std::filesystem::path previewsFolder() const;
 
   SQLite::Database& database() { return *database_; }
 
@@ -80,5 +82,7 @@ std::optional<std::int64_t> optionalNumber(const SQLite::Column& column);
 
 /// Seconds since 1970, as the state keeps moments.
 std::int64_t currentTime();
+/// The same in milliseconds, as cameras need it.
+std::int64_t currentMilliseconds();
 
 } // namespace lumora::sandbox

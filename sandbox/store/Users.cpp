@@ -1,36 +1,13 @@
 #include "Users.h"
 
-#include <sodium.h>
-
-#include <array>
-#include <stdexcept>
+#include "Passwords.h"
 
 namespace lumora::sandbox {
-
-namespace {
-
-// The least that the algorithm allows: every tool run checks a password, and this is no place for real secrets.
-constexpr unsigned long long operations = crypto_pwhash_argon2id_OPSLIMIT_MIN;
-constexpr std::size_t memory = crypto_pwhash_argon2id_MEMLIMIT_MIN;
-
-std::string hashOf(const std::string& password) {
-  std::array<char, crypto_pwhash_STRBYTES> hash{};
-  if (sodium_init() < 0 || crypto_pwhash_str(hash.data(), password.data(), password.size(), operations, memory) != 0) {
-    throw std::runtime_error("the password could not be hashed");
-  }
-  return hash.data();
-}
-
-bool matches(const std::string& hash, const std::string& password) {
-  return sodium_init() >= 0 && crypto_pwhash_str_verify(hash.c_str(), password.data(), password.size()) == 0;
-}
-
-} // namespace
 
 void addUser(Store& store, const User& user, const std::string& password) {
   store.execute("INSERT INTO users VALUES (?, ?, ?) ON CONFLICT (name) DO UPDATE SET full_name = excluded.full_name, "
                 "password_hash = excluded.password_hash",
-                user.name, user.fullName, hashOf(password));
+                user.name, user.fullName, hashOfPassword(password));
 }
 
 bool removeUser(Store& store, const std::string& name) {
@@ -53,7 +30,7 @@ std::optional<User> findUser(Store& store, const std::string& name) {
 
 std::optional<User> authenticate(Store& store, const std::string& name, const std::string& password) {
   auto row = store.query("SELECT full_name, password_hash FROM users WHERE name = ?", name);
-  if (!row.executeStep() || !matches(row.getColumn(1).getString(), password)) {
+  if (!row.executeStep() || !passwordMatches(row.getColumn(1).getString(), password)) {
     return std::nullopt;
   }
   return User{name, row.getColumn(0).getString()};

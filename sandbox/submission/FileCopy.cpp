@@ -75,32 +75,60 @@ private:
   int number_;
 };
 
-std::string hexadecimal(const std::array<unsigned char, crypto_hash_sha256_BYTES>& digest) {
-  std::array<char, crypto_hash_sha256_BYTES * 2 + 1> text{};
-  return sodium_bin2hex(text.data(), text.size(), digest.data(), digest.size());
+/// Writes a file, and counts and digests what was written.
+class Destination {
+public:
+  explicit Destination(const std::filesystem::path& path) : descriptor_(path, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC) {
+    crypto_hash_sha256_init(&hash_);
+  }
+
+  void write(const unsigned char* bytes, std::size_t size) {
+    crypto_hash_sha256_update(&hash_, bytes, size);
+    descriptor_.writeAll(bytes, size);
+    size_ += static_cast<std::int64_t>(size);
+  }
+
+  Copied finish() {
+    std::array<unsigned char, crypto_hash_sha256_BYTES> digest{};
+    crypto_hash_sha256_final(&hash_, digest.data());
+    std::array<char, crypto_hash_sha256_BYTES * 2 + 1> text{};
+    return {size_, sodium_bin2hex(text.data(), text.size(), digest.data(), digest.size())};
+  }
+
+private:
+  Descriptor descriptor_;
+  crypto_hash_sha256_state hash_{};
+  std::int64_t size_ = 0;
+};
+
+/// A transfer that takes its time shall be seen to go on.
+std::size_t bufferSize(const Pace& pace) {
+  constexpr std::size_t large = std::size_t{1} << 20;
+  constexpr std::size_t small = std::size_t{1} << 14;
+  return pace ? small : large;
 }
 
 } // namespace
 
-Copied copyFile(const std::filesystem::path& source, const std::filesystem::path& destination) {
+Copied copyFile(const std::filesystem::path& source, const std::filesystem::path& destination, const Pace& pace) {
   // Not blocking: a named pipe in place of a file would be waited for.
   const Descriptor input(source, O_RDONLY | O_CLOEXEC | O_NONBLOCK);
   input.requireRegularFile();
-  const Descriptor output(destination, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC);
-
-  crypto_hash_sha256_state hash;
-  crypto_hash_sha256_init(&hash);
-  Copied copied;
-  std::vector<unsigned char> buffer(std::size_t{1} << 20);
+  Destination output(destination);
+  std::vector<unsigned char> buffer(bufferSize(pace));
   while (const std::size_t count = input.readSome(buffer)) {
-    crypto_hash_sha256_update(&hash, buffer.data(), count);
-    output.writeAll(buffer.data(), count);
-    copied.size += static_cast<std::int64_t>(count);
+    output.write(buffer.data(), count);
+    if (pace) {
+      pace(count);
+    }
   }
-  std::array<unsigned char, crypto_hash_sha256_BYTES> digest{};
-  crypto_hash_sha256_final(&hash, digest.data());
-  copied.sha256 = hexadecimal(digest);
-  return copied;
+  return output.finish();
+}
+
+Copied writeContent(const std::string& content, const std::filesystem::path& destination) {
+  Destination output(destination);
+  output.write(reinterpret_cast<const unsigned char*>(content.data()), content.size());
+  return output.finish();
 }
 
 } // namespace lumora::sandbox

@@ -2,7 +2,6 @@
 
 #include "../Status.h"
 #include "../store/Uploads.h"
-#include "FileCopy.h"
 
 #include <cerrno>
 #include <system_error>
@@ -78,11 +77,16 @@ bool Staging::makeFolder() {
   return false;
 }
 
-StoredFile Staging::add(const fs::path& source) {
-  // Numbered, because files from several folders may have one name.
+StoredFile Staging::add(const fs::path& source, const Pace& pace) {
   const std::string name = source.filename().string();
-  const std::string storedName = std::to_string(++count_) + "-" + name;
-  const Copied copied = copyFile(source, folder_ / storedName);
+  const std::string storedName = nextName(name);
+  const Copied copied = copyFile(source, folder_ / storedName, pace);
+  return {name, storedName, copied.size, copied.sha256};
+}
+
+StoredFile Staging::addContent(const std::string& name, const std::string& content) {
+  const std::string storedName = nextName(name);
+  const Copied copied = writeContent(content, folder_ / storedName);
   return {name, storedName, copied.size, copied.sha256};
 }
 
@@ -90,6 +94,18 @@ void Staging::publish() {
   const fs::path filed = folderOf(store_, uuid_);
   fs::rename(folder_, filed);
   folder_ = filed;
+}
+
+std::int64_t bytesOfUpload(const Store& store, const std::string& uuid) {
+  std::int64_t sum = 0;
+  std::error_code ignored;
+  // The folder may go away at any moment.
+  for (fs::directory_iterator entry(store.incomingFolder() / uuid, ignored), end; entry != end;
+       entry.increment(ignored)) {
+    const auto size = entry->file_size(ignored);
+    sum += ignored ? 0 : static_cast<std::int64_t>(size);
+  }
+  return sum;
 }
 
 void clearAway(Store& store) {

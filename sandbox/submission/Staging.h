@@ -1,6 +1,7 @@
 #pragma once
 
 #include "../store/Episodes.h"
+#include "FileCopy.h"
 
 #include <LumoraKit/platform/Files.h>
 
@@ -20,7 +21,9 @@ public:
   /// The UUID of the episode to be.
   const std::string& uuid() const { return uuid_; }
   /// Copies a file into the folder; one that cannot be copied whole is refused.
-  StoredFile add(const std::filesystem::path& source);
+  StoredFile add(const std::filesystem::path& source, const Pace& pace);
+  /// Writes a file of this name and content into the folder.
+  StoredFile addContent(const std::string& name, const std::string& content);
   /// Moves the folder among the filed ones. To be called within the change of the store that files the episode.
   void publish();
   /// Leaves the folder where it is: it was filed, or another process goes on with it.
@@ -28,6 +31,8 @@ public:
 
 private:
   bool makeFolder();
+  /// Numbered, because files from several folders may have one name.
+  std::string nextName(const std::string& name) { return std::to_string(++count_) + "-" + name; }
 
   const Store& store_;
   std::string uuid_;
@@ -36,6 +41,9 @@ private:
   std::size_t count_ = 0;
   bool isKept_ = false;
 };
+
+/// How many bytes of an upload that goes on have arrived.
+std::int64_t bytesOfUpload(const Store& store, const std::string& uuid);
 
 /// Removes what killed tools left behind, and calls their uploads failed.
 void clearAway(Store& store);

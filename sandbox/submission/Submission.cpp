@@ -1,16 +1,19 @@
 #include "Submission.h"
 
 #include "../Status.h"
+#include "../Strike.h"
 #include "../store/Recordings.h"
 #include "../store/Uploads.h"
 #include "../store/Workflows.h"
 #include "Metadata.h"
 #include "Staging.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
 #include <memory>
 #include <numeric>
+#include <thread>
 
 #include <fcntl.h>
 #include <unistd.h>
@@ -73,8 +76,12 @@ std::vector<std::string> removeSources(const std::vector<fs::path>& sources) {
   return remaining;
 }
 
-void record(Store& store, Staging& staging, const Episode& episode) {
+void record(Store& store, Staging& staging, const Submission& submission) {
+  const Episode& episode = submission.episode;
   store.change([&] {
+    if (submission.alongside) {
+      submission.alongside();
+    }
     if (episode.slotUUID && findSlot(store, *episode.slotUUID)->isFiled) {
       refuseFiledSlot(*episode.slotUUID);
     }
@@ -85,13 +92,16 @@ void record(Store& store, Staging& staging, const Episode& episode) {
   staging.keep();
 }
 
-Filed fileFrom(Store& store, Staging& staging, Submission& submission) {
+Filed fileFrom(Store& store, Staging& staging, Submission& submission, const Pace& pace) {
   submission.episode.uuid = staging.uuid();
   for (const auto& source : submission.sources) {
-    submission.episode.files.push_back(staging.add(source));
+    submission.episode.files.push_back(staging.add(source, pace));
+  }
+  if (submission.material) {
+    submission.episode.files.push_back(staging.addContent(submission.material->first, submission.material->second));
   }
   submission.episode.submitted = currentTime();
-  record(store, staging, submission.episode);
+  record(store, staging, submission);
   return {staging.uuid(), submission.removesSources ? removeSources(submission.sources) : std::vector<std::string>{}};
 }
 
@@ -124,10 +134,18 @@ void leaveCaller() {
   }
 }
 
+/// A latency that strikes a transfer is spread over its bytes; other faults strike before the first one.
+Pace strikeTransfer(Store& store, std::int64_t size) {
+  const std::chrono::milliseconds latency = strikeTransfer(store);
+  return latency.count() == 0 ? nullptr : Pace([latency, size](std::size_t count) {
+    std::this_thread::sleep_for(latency * count / std::max<std::int64_t>(size, 1));
+  });
+}
+
 void transferOrThrow(Store& store, Staging& staging, Submission& submission) {
   store.resume();
   try {
-    fileFrom(store, staging, submission);
+    fileFrom(store, staging, submission, strikeTransfer(store, sizeOf(submission.sources)));
   } catch (const std::exception& failure) {
     failUpload(store, staging.uuid(), failure.what());
   }
@@ -166,7 +184,7 @@ Submission prepare(Store& store, const SubmissionRequest& request, const User& u
 
 Filed fileNow(Store& store, Submission submission) {
   Staging staging(store);
-  return fileFrom(store, staging, submission);
+  return fileFrom(store, staging, submission, nullptr);
 }
 
 std::string fileInBackground(Store& store, Submission submission) {

@@ -3,6 +3,9 @@
 #include "../store/Episodes.h"
 #include "../store/Users.h"
 
+#include <functional>
+#include <utility>
+
 namespace lumora::sandbox {
 
 /// What is to be filed, checked as far as it can be without touching the files.
@@ -12,6 +15,10 @@ struct Submission {
   std::vector<std::filesystem::path> sources;
   /// Remove the sources once they are filed.
   bool removesSources = false;
+  /// What the server has itself and files like a source: name and content.
+  std::optional<std::pair<std::string, std::string>> material = std::nullopt;
+  /// Done in the change of the store that files the episode; it may refuse.
+  std::function<void()> alongside = nullptr;
 };
 
 /// What a caller names.
