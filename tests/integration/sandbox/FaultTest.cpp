@@ -1,6 +1,5 @@
 #include "Requests.h"
-
-#include <LumoraKit/platform/PropertyList.h>
+#include "ToolProcess.h"
 
 #include <chrono>
 
@@ -60,6 +59,50 @@ TEST(Fault, replyIsLate_whenThereIsLatency) {
   EXPECT_GE(std::chrono::steady_clock::now() - start, std::chrono::milliseconds(300));
 }
 
+TEST(Fault, toolDiesOfTheSignal_whenItCrashes) {
+  const SandboxServer server;
+  for (const auto* signal : {"11", "9", "6"}) {
+    ASSERT_THAT(server.administrate({"inject", "crash"}, {"--signal", signal, "--times", "1"}), Succeeded());
+    const auto run = server.request(listUploads);
+    EXPECT_EQ(run.status, 128 + std::stoi(signal));
+    EXPECT_EQ(run.standardOutput, "");
+  }
+  EXPECT_THAT(server.request(listUploads), Succeeded());
+}
+
+TEST(Fault, replyIsItsFirstHalf_whenItIsPartial) {
+  const SandboxServer server;
+  const auto whole = server.request(getConfiguration).standardOutput;
+  for (const auto& status : {0, 32}) {
+    ASSERT_THAT(server.administrate({"inject", "partial"}, {"--status", std::to_string(status), "--times", "1"}),
+                Succeeded());
+    const auto run = server.request(getConfiguration);
+    EXPECT_EQ(run.status, status);
+    EXPECT_EQ(run.standardOutput, whole.substr(0, whole.size() / 2));
+  }
+}
+
+TEST(Fault, workIsDone_whenTheReplyIsPartial) {
+  const SandboxServer server;
+  ASSERT_THAT(server.administrate({"inject", "partial"}), Succeeded());
+  EXPECT_THAT(server.request({"setconfig", "Capture=high"}, "lumexec"), Succeeded());
+  ASSERT_THAT(server.administrate({"inject", "clear"}), Succeeded());
+  EXPECT_EQ(replyTo(server.request(getConfiguration)).string("Capture"), "high");
+}
+
+TEST(Fault, toolWritesHalfAndNeverEnds_whenItStalls) {
+  const SandboxServer server;
+  const auto whole = server.request(getConfiguration).standardOutput;
+  ASSERT_THAT(server.administrate({"inject", "stall"}), Succeeded());
+  const auto output = server.folder() / "output";
+  const auto script = writeFile(server.folder() / "script", "#!/bin/sh\nexec '" + server.tool().string() +
+                                                                "' --plistin >'" + output.string() + "'\n");
+  std::filesystem::permissions(script, std::filesystem::perms::owner_all);
+  ToolProcess tool(script, writeFile(server.folder() / "request", xmlDescription(getConfiguration).value()));
+  EXPECT_TRUE(waitUntil([&] { return contentOf(output) == whole.substr(0, whole.size() / 2); }));
+  EXPECT_TRUE(tool.isRunning());
+}
+
 TEST(Fault, isListedUntilCleared) {
   const SandboxServer server;
   ASSERT_THAT(server.administrate({"inject", "hang"}, {"--command", "submit", "--times", "3"}), Succeeded());
@@ -79,4 +122,11 @@ TEST(Fault, isRefused_whenThereIsNoSuchCommand) {
   const SandboxServer server;
   EXPECT_THAT(server.administrate({"inject", "hang"}, {"--command", "sumbit"}), EndedWith(2, "sumbit"));
   EXPECT_THAT(server.administrate({"inject", "hang"}, {"--command", "start"}), Succeeded());
+}
+
+TEST(Fault, isRefused_whenATransferCannotMeetIt) {
+  const SandboxServer server;
+  for (const auto* kind : {"hang", "stall", "partial", "garbage"}) {
+    EXPECT_THAT(server.administrate({"inject", kind}, {"--command", "transfer"}), EndedWith(2, "transfer")) << kind;
+  }
 }

@@ -1,21 +1,13 @@
 #include "Requests.h"
 
-#include <LumoraKit/platform/PropertyList.h>
-
 #include <unistd.h>
 
 using namespace lumora;
 using namespace lumora::tests;
 using testing::ElementsAre;
-using testing::HasSubstr;
 using testing::SizeIs;
 
 namespace {
-
-Dictionary replyTo(const ProgramRun& run) {
-  EXPECT_THAT(run, Succeeded());
-  return dictionaryWithXMLDescription(run.standardOutput).value_or(Dictionary{});
-}
 
 Array listInfo(const std::string& address) {
   return {"listinfo", Array{"server", address}};
@@ -179,22 +171,4 @@ TEST(CreateRecording, isStatus12_whenTheWorkflowIsUnknown) {
   const SandboxServer server;
   EXPECT_THAT(server.request(asUser(server, {"create_recording", Array{"workflow_uuid", "no-such-uuid"}})),
               EndedWith(12, "no workflow with the UUID"));
-}
-
-TEST(Sharing, tellsThatNothingIsShared) {
-  const SandboxServer server;
-  EXPECT_EQ(replyTo(server.request({"isbound", "plist"})).find("Bound")->boolean(), false);
-  EXPECT_EQ(replyTo(server.request({"getconfig", "plist"})).string("CameraName"), "");
-  EXPECT_TRUE(replyTo(server.request(asUser(server, {"listcameras"}))).array("cameras")->empty());
-}
-
-TEST(Sharing, isStatus36_whenThereIsNoSuchCamera) {
-  const SandboxServer server;
-  EXPECT_THAT(server.request(asUser(server, {Array{"start", "Studio A"}, Array{"delay", 0}})),
-              EndedWith(36, "no remote camera named \"Studio A\""));
-}
-
-TEST(Sharing, isStatus37_whenTheCommandIsNotServed) {
-  const SandboxServer server;
-  EXPECT_THAT(server.request({"setconfig", "Capture=high"}), EndedWith(37, "does not offer the command"));
 }

@@ -2,6 +2,8 @@
 
 #include "support/Sandbox.h"
 
+#include <LumoraKit/platform/PropertyList.h>
+
 #include <gmock/gmock.h>
 
 #include <chrono>
@@ -17,6 +19,13 @@ namespace lumora::tests {
 /// A request of the server's user: the login, then the elements.
 inline Array asUser(const SandboxServer& server, const Array& elements) {
   Array request = server.login();
+  request.insert(request.end(), elements.begin(), elements.end());
+  return request;
+}
+
+inline Array asUser(const std::string& user, const std::string& password, const Array& elements) {
+  Array request{Array{"server", "localhost:8170"}, Array{"auth", "Password"}, Array{"user", user},
+                Array{"pass", password}};
   request.insert(request.end(), elements.begin(), elements.end());
   return request;
 }
@@ -63,6 +72,12 @@ MATCHER_P2(EndedWith, status, reason, "") {
 MATCHER(Succeeded, "") {
   *result_listener << "status " << arg.status << ", " << arg.standardError;
   return arg.status == 0 && arg.standardError.empty();
+}
+
+/// The reply of a tool that must have succeeded; empty when it has not.
+inline Dictionary replyTo(const ProgramRun& run) {
+  EXPECT_THAT(run, Succeeded());
+  return dictionaryWithXMLDescription(run.standardOutput).value_or(Dictionary{});
 }
 
 } // namespace lumora::tests

@@ -2,7 +2,6 @@
 #include "ToolProcess.h"
 
 #include <LumoraKit/platform/Platform.h>
-#include <LumoraKit/platform/PropertyList.h>
 
 #include <sandbox/store/Store.h>
 

@@ -1,7 +1,5 @@
 #include "Requests.h"
 
-#include <LumoraKit/platform/PropertyList.h>
-
 using namespace lumora;
 using namespace lumora::tests;
 using testing::IsEmpty;

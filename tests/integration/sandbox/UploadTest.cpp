@@ -1,7 +1,8 @@
 #include "Requests.h"
 
 #include <LumoraKit/platform/Platform.h>
-#include <LumoraKit/platform/PropertyList.h>
+
+#include <set>
 
 #include <sandbox/store/Uploads.h>
 #include <sandbox/submission/Staging.h>
@@ -52,6 +53,7 @@ TEST_F(Uploads, asynchronousSubmissionIsListedThenCompleted) {
   EXPECT_EQ(upload.string("title"), "Title");
   EXPECT_EQ(upload.string("workflow"), "single-video");
   EXPECT_EQ(upload.find("size")->integer(), 3);
+  EXPECT_EQ(upload.find("sent")->integer(), 3);
   EXPECT_TRUE(upload.find("ended")->date());
   EXPECT_EQ(server.episodes().at(0).string("uuid"), upload.string("uuid"));
   EXPECT_TRUE(waitUntil([&] { return !std::filesystem::exists(movie); }));
@@ -104,6 +106,67 @@ TEST_F(Uploads, isLeftAlone_whileItsProcessLives) {
   insertUpload(store, upload);
   EXPECT_EQ(list().at(0).string("state"), "uploading");
   EXPECT_TRUE(std::filesystem::exists(store.incomingFolder() / upload.uuid));
+}
+
+TEST_F(Uploads, showsItsProgress_whileItIsUnderWay) {
+  constexpr std::int64_t size = 400'000;
+  ASSERT_THAT(server.administrate({"inject", "latency"}, {"--command", "transfer", "--milliseconds", "2000"}),
+              Succeeded());
+  ASSERT_THAT(server.request(submission(writeFile(server.folder() / "movie.mov", std::string(size, 'x')))),
+              Succeeded());
+  std::int64_t sent = 0;
+  std::set<std::int64_t> seen;
+  ASSERT_TRUE(waitUntil([&] {
+    const auto upload = list().at(0);
+    const auto now = upload.find("sent")->integer().value();
+    EXPECT_GE(now, sent);
+    sent = now;
+    seen.insert(now);
+    return upload.string("state") == "completed";
+  }));
+  EXPECT_EQ(sent, size);
+  // Nothing or all of it would be no progress.
+  EXPECT_GE(seen.size(), 3U);
+}
+
+TEST_F(Uploads, isListedAsFailedWithTheReason_whenItsTransferFails) {
+  ASSERT_THAT(server.administrate({"inject", "failure"},
+                                  {"--command", "transfer", "--status", "32", "--message", "the connection was lost"}),
+              Succeeded());
+  const auto movie = writeFile(server.folder() / "movie.mov", "abc");
+  ASSERT_THAT(server.request(submission(movie)), Succeeded());
+  const auto upload = ended();
+  EXPECT_EQ(upload.string("state"), "failed");
+  EXPECT_EQ(upload.string("message"), "the connection was lost");
+  EXPECT_EQ(upload.find("sent")->integer(), 0);
+  EXPECT_THAT(server.episodes(), IsEmpty());
+  EXPECT_TRUE(std::filesystem::exists(movie));
+}
+
+TEST_F(Uploads, isListedAsFailed_whenItsTransferCrashes) {
+  ASSERT_THAT(server.administrate({"inject", "crash"}, {"--command", "transfer"}), Succeeded());
+  ASSERT_THAT(server.request(submission(writeFile(server.folder() / "movie.mov", "abc"))), Succeeded());
+  EXPECT_EQ(ended().string("message"), "the transfer was interrupted");
+  EXPECT_THAT(server.episodes(), IsEmpty());
+}
+
+TEST_F(Uploads, transferIsSpared_whenEveryCommandIsStruck) {
+  ASSERT_THAT(server.administrate({"inject", "latency"}, {"--milliseconds", "1", "--times", "2"}), Succeeded());
+  ASSERT_THAT(server.request(submission(writeFile(server.folder() / "movie.mov", "abc"))), Succeeded());
+  EXPECT_TRUE(waitUntil([&] { return !server.episodes().empty(); }));
+  // Only the tool was struck.
+  EXPECT_THAT(server.administrate({"inject", "list"}).standardOutput, testing::HasSubstr("\t1 times\t"));
+}
+
+TEST(LibraryServer, takesSeveralFilesSynchronouslyOnly) {
+  const SandboxServer server({"--library-server"});
+  const auto file = pair("file", writeFile(server.folder() / "movie.mov", "abc"));
+  const auto metadata = pair("metadata", writeMetadata(server));
+  const Array workflow{"workflow", "single-video"};
+  EXPECT_THAT(server.request(asUser(server, {"submit", Array{"async"}, file, file, metadata, workflow})),
+              EndedWith(12, "synchronously only"));
+  EXPECT_THAT(server.request(asUser(server, {"submit", file, file, metadata, workflow})), Succeeded());
+  EXPECT_THAT(server.request(asUser(server, {"submit", Array{"async"}, file, metadata, workflow})), Succeeded());
 }
 
 TEST_F(Uploads, endedOnesAreForgotten_whenCleared) {
