@@ -3,6 +3,9 @@
 #include <chrono>
 #include <ctime>
 #include <stdexcept>
+#include <thread>
+
+#include <sqlite3.h>
 
 namespace lumora::sandbox {
 
@@ -10,7 +13,7 @@ namespace fs = std::filesystem;
 
 namespace {
 
-constexpr int busyTimeout = 60'000; // milliseconds
+constexpr std::chrono::milliseconds busyTimeout{60'000};
 constexpr int schemaVersion = 2;
 
 constexpr const char* schema = R"sql(
@@ -52,10 +55,20 @@ fs::path databasePath(const fs::path& root) {
   return stateFolder(root) / "server.sqlite";
 }
 
+/// A change takes a fraction of a millisecond; SQLite's own handler would soon wait a tenth of a second for one.
+int waitWhileBusy(void*, int count) {
+  constexpr std::chrono::microseconds pause{500};
+  std::this_thread::sleep_for(pause);
+  return count < busyTimeout / pause ? 1 : 0;
+}
+
 std::unique_ptr<SQLite::Database> openDatabase(const fs::path& root, int flags) {
-  auto database = std::make_unique<SQLite::Database>(databasePath(root).string(), flags, busyTimeout);
+  auto database = std::make_unique<SQLite::Database>(databasePath(root).string(), flags);
+  sqlite3_busy_handler(database->getHandle(), waitWhileBusy, nullptr);
   // A killed process loses nothing in this mode; only a power cut may lose the last transactions.
-  database->exec("PRAGMA synchronous = NORMAL; PRAGMA foreign_keys = ON");
+  database->exec("PRAGMA synchronous = NORMAL; PRAGMA foreign_keys = ON; PRAGMA wal_autocheckpoint = 200");
+  // Nearly every tool is the last one to close: none shall wait for the disk because of that.
+  sqlite3_db_config(database->getHandle(), SQLITE_DBCONFIG_NO_CKPT_ON_CLOSE, 1, nullptr);
   return database;
 }
 
