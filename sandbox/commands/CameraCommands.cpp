@@ -8,6 +8,7 @@
 #include <LumoraKit/platform/Files.h>
 
 #include <algorithm>
+#include <cctype>
 #include <chrono>
 #include <initializer_list>
 #include <thread>
@@ -43,11 +44,27 @@ Camera cameraFor(Context& context, const std::string& name, const std::string& d
   return camera;
 }
 
+/// RFC 8089, with RFC 3986's escapes.
+std::string fileURL(const std::filesystem::path& path) {
+  constexpr std::string_view digits = "0123456789ABCDEF";
+  constexpr std::string_view unreserved = "-._~/";
+  std::string url = "file://";
+  for (const char letter : path.string()) {
+    const auto byte = static_cast<unsigned char>(letter);
+    if ((byte < 0x80 && std::isalnum(byte) != 0) || unreserved.find(letter) != std::string_view::npos) {
+      url += letter;
+    } else {
+      url += {'%', digits[byte >> 4U], digits[byte & 0xFU]};
+    }
+  }
+  return url;
+}
+
 Dictionary description(const Store& store, const Camera& camera) {
   const std::int64_t now = currentMilliseconds();
   Dictionary description{{"name", camera.name},
                          {"state", std::string(nameOf(stateAt(camera, now)))},
-                         {"preview", "file://" + previewPath(store, camera).string()}};
+                         {"preview", fileURL(previewPath(store, camera))}};
   if (camera.take) {
     constexpr double millisecondsOfASecond = 1000;
     description.set("user", camera.take->user);

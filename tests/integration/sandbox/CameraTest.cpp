@@ -22,7 +22,7 @@ protected:
   ProgramRun start(int delay = 0) const { return request({Array{"start", camera}, Array{"delay", delay}}); }
   ProgramRun startAudioOnly() const { return request({Array{"start", camera}, Array{"delay", 0}, "audio_only"}); }
   ProgramRun stopInto(const Array& target) const {
-    return request({Array{"stop", camera}, pair("metadata", writeMetadata(server, "Lecture 1")), target});
+    return request({Array{"stop", camera}, pair("metadata", metadata), target});
   }
   ProgramRun stop() const { return stopInto({"workflow", "single-video"}); }
 
@@ -38,6 +38,7 @@ protected:
 
   static constexpr const char* camera = "Studio A";
   SandboxServer server;
+  std::filesystem::path metadata = writeMetadata(server, "Lecture 1");
 };
 
 /// Brings the camera into a state and tries what the state forbids.
@@ -144,9 +145,9 @@ TEST_F(Cameras, stopFilesTheRecordingIntoTheWorkflow) {
   EXPECT_EQ(episode.string("title"), "Lecture 1");
   EXPECT_EQ(episode.string("workflow"), "single-video");
   EXPECT_EQ(filed().string("name"), "Studio A.mov");
-  const auto& metadata = *episode.dictionary("recording_metadata");
+  const auto& properties = *episode.dictionary("recording_metadata");
   for (const auto* key : {"RecordingMetadata_START_DATE", "RecordingMetadata_END_DATE", "RecordingMetadata_DURATION"}) {
-    EXPECT_TRUE(metadata.string(key)) << key;
+    EXPECT_TRUE(properties.string(key)) << key;
   }
   EXPECT_EQ(state(), "idle");
 }

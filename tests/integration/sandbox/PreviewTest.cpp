@@ -1,5 +1,7 @@
 #include "Requests.h"
 
+#include <LumoraKit/platform/Platform.h>
+
 #include <array>
 
 #include <png.h>
@@ -84,4 +86,17 @@ TEST_F(Preview, isAtItsURL) {
   const auto url = status({}).string("preview").value();
   ASSERT_EQ(url.substr(0, 7), "file://");
   EXPECT_TRUE(decode(contentOf(url.substr(7))));
+}
+
+TEST_F(Preview, urlIsEscaped_whenTheRootHasOtherLetters) {
+  const auto moved = server.folder() / "se rver\xC3\xBC%";
+  std::filesystem::rename(server.root(), moved);
+  std::string output;
+  std::string error;
+  ASSERT_EQ(Platform::current().toolRunner->run(
+                (moved / "usr/bin/lumctl").string(), {"--plistin"},
+                xmlDescription(asUser(server, Array(1, Value(Array{"status", "Studio A"})))).value(), output, error),
+            0)
+      << error;
+  EXPECT_THAT(output, testing::HasSubstr("/se%20rver%C3%BC%25/var/lib/lumora/previews/"));
 }

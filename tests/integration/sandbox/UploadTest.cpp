@@ -110,7 +110,7 @@ TEST_F(Uploads, isLeftAlone_whileItsProcessLives) {
 
 TEST_F(Uploads, showsItsProgress_whileItIsUnderWay) {
   constexpr std::int64_t size = 400'000;
-  ASSERT_THAT(server.administrate({"inject", "latency"}, {"--command", "transfer", "--milliseconds", "2000"}),
+  ASSERT_THAT(server.administrate({"inject", "latency"}, {"--command", "transfer", "--milliseconds", "1000"}),
               Succeeded());
   ASSERT_THAT(server.request(submission(writeFile(server.folder() / "movie.mov", std::string(size, 'x')))),
               Succeeded());
