@@ -34,7 +34,9 @@ std::string fixed(std::uint32_t whole) {
 }
 
 std::string zeros(std::size_t count) {
-  return std::string(count, '\0');
+  std::string text;
+  text.resize(count);
+  return text;
 }
 
 std::string atom(std::string_view type, const std::string& content) {

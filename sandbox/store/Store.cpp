@@ -1,11 +1,11 @@
 #include "Store.h"
 
+#include <sqlite3.h>
+
 #include <chrono>
 #include <ctime>
 #include <stdexcept>
 #include <thread>
-
-#include <sqlite3.h>
 
 namespace lumora::sandbox {
 
