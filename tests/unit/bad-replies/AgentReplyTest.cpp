@@ -27,7 +27,7 @@ protected:
 };
 
 TEST_P(AgentReplyTest, statusIsANumber_orTheReplyIsMalformed) {
-  const Value& status = GetParam().value;
+  const Value& status = GetParam().make();
   const auto action = outcomeOf(Dictionary{{"terminationStatus", status}});
   ASSERT_TRUE(action->error());
   EXPECT_EQ(action->result(), nullptr);
@@ -37,7 +37,7 @@ TEST_P(AgentReplyTest, statusIsANumber_orTheReplyIsMalformed) {
 }
 
 TEST_P(AgentReplyTest, standardErrorIsAText_orAbsent) {
-  const Value& standardError = GetParam().value;
+  const Value& standardError = GetParam().make();
   const auto action = outcomeOf(Dictionary{{"terminationStatus", 35}, {"standardError", standardError}});
   ASSERT_TRUE(action->error());
   EXPECT_EQ(action->error()->code(), 35);
@@ -46,13 +46,13 @@ TEST_P(AgentReplyTest, standardErrorIsAText_orAbsent) {
 }
 
 TEST_P(AgentReplyTest, standardOutputIsAPropertyList_orThereIsNoResult) {
-  const auto action = outcomeOf(Dictionary{{"terminationStatus", 0}, {"standardOutput", GetParam().value}});
+  const auto action = outcomeOf(Dictionary{{"terminationStatus", 0}, {"standardOutput", GetParam().make()}});
   EXPECT_EQ(action->error(), nullptr);
   EXPECT_EQ(action->result(), nullptr);
 }
 
 TEST_P(AgentReplyTest, standardOutputMayHoldAnything) {
-  const Dictionary output{{"field", GetParam().value}};
+  const Dictionary output{{"field", GetParam().make()}};
   const auto action = outcomeOf(Dictionary{{"standardOutput", lumora::xmlDescription(output).value()}});
   EXPECT_EQ(action->error(), nullptr);
   ASSERT_TRUE(action->result());

@@ -26,7 +26,8 @@ protected:
 
   /// What is kept of the field: a text as it is, of everything else nothing.
   OptionalText kept() const {
-    const std::string* const text = GetParam().value.string();
+    const lumora::Value value = GetParam().make();
+    const std::string* const text = value.string();
     return text ? OptionalText(*text) : std::nullopt;
   }
 
@@ -36,27 +37,27 @@ protected:
 // Texts are compared without printing them: one has eight million characters.
 
 TEST_P(LoginReplyTest, versionIsKept_whenItIsAText) {
-  const auto session = sessionAfter({{"server_version", GetParam().value}}, {});
+  const auto session = sessionAfter({{"server_version", GetParam().make()}}, {});
   ASSERT_TRUE(session);
   EXPECT_TRUE(session->version() == kept());
 }
 
 TEST_P(LoginReplyTest, namesAreKept_whenTheyAreTexts) {
-  const auto session = sessionAfter({}, {{"user_shortname", GetParam().value}, {"user_fullname", GetParam().value}});
+  const auto session = sessionAfter({}, {{"user_shortname", GetParam().make()}, {"user_fullname", GetParam().make()}});
   ASSERT_TRUE(session);
   EXPECT_TRUE(session->userName() == kept());
   EXPECT_TRUE(session->userFullName() == kept());
 }
 
 TEST_P(LoginReplyTest, serverIsNoLibrary_whateverElseItSays) {
-  const auto session = sessionAfter({}, {{"server", GetParam().value}});
+  const auto session = sessionAfter({}, {{"server", GetParam().make()}});
   ASSERT_TRUE(session);
   EXPECT_FALSE(session->isLumoraLibraryServer());
 }
 
 TEST_P(LoginReplyTest, fieldsThatNobodyReadsAreOfNoConsequence) {
-  const auto session =
-      sessionAfter({{"http_auth_type", GetParam().value}}, {{"workflows", GetParam().value}, {"", GetParam().value}});
+  const auto session = sessionAfter({{"http_auth_type", GetParam().make()}},
+                                    {{"workflows", GetParam().make()}, {"", GetParam().make()}});
   EXPECT_TRUE(session);
 }
 

@@ -24,7 +24,7 @@ protected:
 };
 
 TEST_P(ToolReplyTest, comesThroughAsItIs) {
-  const Dictionary reply{{std::string(LMRSubmissionUUIDSKey), GetParam().value}};
+  const Dictionary reply{{std::string(LMRSubmissionUUIDSKey), GetParam().make()}};
   platform_.toolRunner->setDefaultReply(ToolReply::success(reply));
   const auto action = Factory::actionToCreateRecordingContainerForWorkflowUUID_session("W-1", nullptr);
   action->runSynchronously();
@@ -50,7 +50,10 @@ std::vector<FieldValue> writableNames() {
 
 class NameTest : public testing::TestWithParam<FieldValue> {
 protected:
-  std::string name() const { return *GetParam().value.string(); }
+  std::string name() const {
+    const Value value = GetParam().make();
+    return *value.string();
+  }
   lumora::fakes::FakePlatform platform_;
 };
 

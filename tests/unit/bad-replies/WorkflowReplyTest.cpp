@@ -23,20 +23,20 @@ protected:
 };
 
 TEST_P(WorkflowReplyTest, isUnsupported_whenTheSourcesAreThat) {
-  expectUnsupported({{"sources", GetParam().value}});
+  expectUnsupported({{"sources", GetParam().make()}});
 }
 
 TEST_P(WorkflowReplyTest, isUnsupported_whenASourceIsThat) {
-  expectUnsupported({{"sources", Array{GetParam().value}}});
-  expectUnsupported({{"sources", Array{GetParam().value, GetParam().value}}});
+  expectUnsupported({{"sources", Array{GetParam().make()}}});
+  expectUnsupported({{"sources", Array{GetParam().make(), GetParam().make()}}});
 }
 
 TEST_P(WorkflowReplyTest, isUnsupported_whenTheTypesAreThat) {
-  expectUnsupported({{"sources", Array{Dictionary{{"sourceTypes", GetParam().value}}}}});
+  expectUnsupported({{"sources", Array{Dictionary{{"sourceTypes", GetParam().make()}}}}});
 }
 
 TEST_P(WorkflowReplyTest, isAFolder_onlyWhenTheFlagIsTrue) {
-  const Dictionary source{{"sourceTypes", Array{"File"}}, {"isFolder", GetParam().value}};
+  const Dictionary source{{"sourceTypes", Array{"File"}}, {"isFolder", GetParam().make()}};
   EXPECT_EQ(workflowType({{"sources", Array{source}}}),
             GetParam().name == "flag" ? LMRWorkflowTypeFolder : LMRWorkflowTypeSingleSource);
 }
