@@ -47,10 +47,7 @@ std::string chooseWorkflow(const std::shared_ptr<LMRSession>& session) {
   const lumora::Array* workflows = reply ? reply->array(LMRWorkflowsKey) : nullptr;
   for (const lumora::Value& entry : workflows ? *workflows : none) {
     const lumora::Dictionary* workflow = entry.dictionary();
-    const lumora::Array* sources = workflow ? workflow->array(LMRWorkflowSourcesKey) : nullptr;
-    const lumora::Dictionary* source = sources && sources->size() == 1 ? sources->front().dictionary() : nullptr;
-    const lumora::Array* types = source ? source->array("sourceTypes") : nullptr;
-    if (types && std::find(types->begin(), types->end(), lumora::Value("Video")) != types->end()) {
+    if (workflow && LMRWorkflowAdditions::acceptsVideo(*workflow)) {
       std::cout << "Workflow: " << workflow->string(LMRWorkflowTitleKey).value_or("") << ".\n";
       return workflow->string(LMRWorkflowNameKey).value_or("");
     }
