@@ -35,9 +35,10 @@ private:
 };
 
 void drawBars(Canvas& canvas) {
-  for (std::uint32_t index = 0; index < bars.size(); ++index) {
-    const std::uint32_t left = index * TestPicture::width / bars.size();
-    const std::uint32_t right = (index + 1) * TestPicture::width / bars.size();
+  constexpr auto barCount = static_cast<std::uint32_t>(bars.size());
+  for (std::uint32_t index = 0; index < barCount; ++index) {
+    const std::uint32_t left = index * TestPicture::width / barCount;
+    const std::uint32_t right = (index + 1) * TestPicture::width / barCount;
     canvas.fill(left, 0, right - left, TestPicture::height, bars.at(index));
   }
 }

@@ -44,4 +44,12 @@ std::size_t peakResidentMemory() {
   return statusBytes("VmHWM:");
 }
 
+bool memoryCanBeMeasured() {
+#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
+  return false;
+#else
+  return true;
+#endif
+}
+
 } // namespace lumora::tests

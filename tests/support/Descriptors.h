@@ -13,5 +13,7 @@ std::size_t threadCount();
 /// Resident memory in bytes: now, and the most there ever was.
 std::size_t residentMemory();
 std::size_t peakResidentMemory();
+/// Whether resident memory is the program's own: a sanitizer keeps much of what was freed.
+bool memoryCanBeMeasured();
 
 } // namespace lumora::tests

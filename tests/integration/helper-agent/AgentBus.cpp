@@ -76,11 +76,12 @@ std::optional<std::string> AgentBus::polkitObstacle() {
   if (getuid() != 0) {
     return "polkitd must be started by root, with an action of its own in " + std::string(actionsFolder);
   }
-  const auto trial = ChildProgram::start(
-      {"unshare", "--mount", "sh", "-c", std::string("mount --bind /tmp ") + rulesFolder + " && echo mounted"});
-  return trial && trial->readLine() == "mounted"
-             ? std::nullopt
-             : std::optional<std::string>("this machine allows no mount namespace of its own");
+  const std::string mount = std::string("mount --bind /tmp ") + rulesFolder + " && echo mounted";
+  const auto trial = ChildProgram::start({"unshare", "--mount", "sh", "-c", mount});
+  if (!trial || trial->readLine() != "mounted") {
+    return "this machine allows no mount namespace of its own";
+  }
+  return std::nullopt;
 }
 
 AgentBus::AgentBus() {
