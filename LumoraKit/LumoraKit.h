@@ -49,6 +49,8 @@
 #include <LumoraKit/recording/LMRCaptureDeviceAdditions.h>
 #include <LumoraKit/recording/LMRCaptureDeviceInputAdditions.h>
 #include <LumoraKit/recording/LMRCaptureSessionAdditions.h>
+#include <LumoraKit/recording/LMRLocalAudioRecorder.h>
+#include <LumoraKit/recording/LMRLocalScreenRecorder.h>
 #include <LumoraKit/recording/LMRLocalVideoRecorder.h>
 #include <LumoraKit/recording/LMRRecorderClasses.h>
 #include <LumoraKit/recording/LMRSourceRecorder.h>

@@ -161,13 +161,26 @@ bool LMRLocalVideoRecorder::decodeWithCoder(const lumora::KeyedUnarchiver& coder
   LMRErrorRef error;
   const auto session = LMRCaptureSessionAdditions::captureSessionWithAudioDevice_videoDevice_error(
       archivedDevice(coder, audioDeviceKey), archivedDevice(coder, videoDeviceKey), &error);
+  if (!takeDecodedSession(session, error)) {
+    return false;
+  }
+  commonInit();
+  return true;
+}
+
+bool LMRLocalVideoRecorder::rebuildSession(const lumora::KeyedUnarchiver& coder, SessionOfAudioDevice makeSession) {
+  LMRErrorRef error;
+  const auto session = makeSession(archivedDevice(coder, audioDeviceKey), &error);
+  return takeDecodedSession(session, error);
+}
+
+bool LMRLocalVideoRecorder::takeDecodedSession(const std::shared_ptr<lumora::CaptureSession>& session,
+                                               const LMRErrorRef& error) {
   if (error) {
     lumora::log("Error unarchiving %@: %@", {className(), lumora::text(error)});
   }
-  if (!session) {
-    return false;
+  if (session) {
+    setCaptureSession(session);
   }
-  setCaptureSession(session);
-  commonInit();
-  return true;
+  return session != nullptr;
 }

@@ -138,6 +138,12 @@ protected:
   /// Rebuilds the session of a new recorder; false when it cannot.
   virtual bool decodeWithCoder(const lumora::KeyedUnarchiver& coder);
 
+  using SessionOfAudioDevice = std::shared_ptr<lumora::CaptureSession> (*)(
+      const std::shared_ptr<lumora::CaptureDevice>& audioDevice, LMRErrorRef* error);
+  /// For a decoding subclass: puts the session of the archived microphone in the place of the one with a camera. The
+  /// output stays. False, with a log line when there is an error, when there is no such session.
+  bool rebuildSession(const lumora::KeyedUnarchiver& coder, SessionOfAudioDevice makeSession);
+
 private:
   // A host time that waits for its sample. The largest one stands for "none"; it is 584 years away.
   class PendingHostTime {
@@ -155,6 +161,7 @@ private:
     std::atomic<lumora::HostTime> time_ = none;
   };
 
+  bool takeDecodedSession(const std::shared_ptr<lumora::CaptureSession>& session, const LMRErrorRef& error);
   void setCompressionOptionsOfConnections() const;
   bool finishFile() const;
   void actOnSample(const lumora::SampleBuffer& sampleBuffer);
