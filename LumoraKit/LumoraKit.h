@@ -53,6 +53,8 @@
 #include <LumoraKit/recording/LMRLocalScreenRecorder.h>
 #include <LumoraKit/recording/LMRLocalVideoRecorder.h>
 #include <LumoraKit/recording/LMRRecorderClasses.h>
+#include <LumoraKit/recording/LMRRemoteAudioRecorder.h>
+#include <LumoraKit/recording/LMRRemoteVideoRecorder.h>
 #include <LumoraKit/recording/LMRSourceRecorder.h>
 #include <LumoraKit/recording/LMRSourceRecorderDelegate.h>
 #include <LumoraKit/workflows/LMRWorkflowAdditions.h>

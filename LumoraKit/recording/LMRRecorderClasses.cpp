@@ -2,6 +2,10 @@
 #include <LumoraKit/recording/LMRLocalScreenRecorder.h>
 #include <LumoraKit/recording/LMRLocalVideoRecorder.h>
 #include <LumoraKit/recording/LMRRecorderClasses.h>
+#include <LumoraKit/recording/LMRRemoteAudioRecorder.h>
+#include <LumoraKit/recording/LMRRemoteVideoRecorder.h>
+
+#include <utility>
 
 namespace {
 
@@ -13,8 +17,8 @@ template <class Recorder> std::pair<const std::string, lumora::KeyedUnarchiver::
 
 lumora::KeyedUnarchiver::ClassTable LMRRecorderClasses() {
   return {
-      entry<LMRLocalVideoRecorder>("LMRLocalVideoRecorder"),
-      entry<LMRLocalAudioRecorder>("LMRLocalAudioRecorder"),
-      entry<LMRLocalScreenRecorder>("LMRLocalScreenRecorder"),
+      entry<LMRLocalVideoRecorder>("LMRLocalVideoRecorder"),   entry<LMRLocalAudioRecorder>("LMRLocalAudioRecorder"),
+      entry<LMRLocalScreenRecorder>("LMRLocalScreenRecorder"), entry<LMRRemoteVideoRecorder>("LMRRemoteVideoRecorder"),
+      entry<LMRRemoteAudioRecorder>("LMRRemoteAudioRecorder"),
   };
 }
