@@ -51,6 +51,7 @@ int administrate(int argc, char** argv) {
   addMasterPasswordCommand(program);
   addEpisodesCommand(program);
   addInjectCommand(program);
+  addAgentCommand(program);
   try {
     program.parse(argc, argv);
     return 0;

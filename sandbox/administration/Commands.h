@@ -16,6 +16,7 @@ void addCameraCommands(CLI::App& program);
 void addMasterPasswordCommand(CLI::App& program);
 void addEpisodesCommand(CLI::App& program);
 void addInjectCommand(CLI::App& program);
+void addAgentCommand(CLI::App& program);
 
 /// The required first argument of every command.
 void addRootArgument(CLI::App& command, std::string& root);

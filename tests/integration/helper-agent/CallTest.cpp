@@ -104,7 +104,7 @@ TEST_F(ActionCallTest, actionFailsAndNothingIsSent_whenNoPropertyListCarriesTheR
   EXPECT_EQ(action->error()->domain(), lumora::HelperAgentErrorDomain);
   EXPECT_EQ(action->error()->code(), static_cast<int>(lumora::HelperAgentError::RequestUnwritable));
   perform("echo");
-  EXPECT_EQ(bus_.agent().readLine(), "echo");
+  EXPECT_EQ(agent_->readLine(), "echo");
 }
 
 } // namespace

@@ -44,7 +44,7 @@ TEST_F(FailureTest, isThatThereIsNoBus_whenItNeverAnswersWithinTheDeadline) {
 }
 
 TEST_F(FailureTest, isThatThereIsNoAgent_whenNobodyServes) {
-  bus_.agent().kill();
+  agent_->kill();
   expectFailure(perform("echo"), HelperAgentError::NoAgent, "There is no helper agent org.vantor.lumagentconfigd: ");
 }
 
@@ -63,7 +63,7 @@ TEST_F(FailureTest, isThatTheAgentEnded_whenItCrashesInMidCall) {
 
 TEST_F(FailureTest, isOver_whenTheAgentIsStartedAgain) {
   perform("crash");
-  ASSERT_TRUE(bus_.startAgent());
+  ASSERT_TRUE(startAgent());
   EXPECT_EQ(perform("echo").reply, Dictionary());
 }
 
@@ -77,7 +77,7 @@ TEST_F(FailureTest, isThatTheRequestIsTooLarge_beforeAnythingIsSent) {
   const Dictionary tooLarge{{"text", std::string(lumora::MaximumHelperAgentRequest, 'x')}};
   expectFailure(perform("echo", tooLarge), HelperAgentError::RequestTooLarge, "takes no more than 16777216");
   EXPECT_EQ(perform("echo").reply, Dictionary());
-  EXPECT_EQ(bus_.agent().readLine(), "echo");
+  EXPECT_EQ(agent_->readLine(), "echo");
 }
 
 TEST_F(FailureTest, isNone_whenTheRequestIsJustNotTooLarge) {
@@ -111,7 +111,7 @@ TEST_F(FailureTest, isThatTheBusIsLost_whenItEndsInMidCall) {
   ASSERT_TRUE(authorization);
   Answer answer;
   std::jthread caller([&] { answer = perform(agents_, "hang", {}, &*authorization); });
-  ASSERT_EQ(bus_.agent().readLine(), "hang");
+  ASSERT_EQ(agent_->readLine(), "hang");
   bus_.stop();
   caller.join();
   expectFailure(answer, HelperAgentError::NoBus, "The connection to the system bus was lost");
@@ -122,12 +122,12 @@ TEST_F(FailureTest, isOver_whenTheBusIsStartedAgain) {
   bus_.stop();
   EXPECT_EQ(perform("echo").reply, std::nullopt);
   ASSERT_TRUE(bus_.start());
-  ASSERT_TRUE(bus_.startAgent());
+  ASSERT_TRUE(startAgent());
   EXPECT_EQ(perform("echo").reply, Dictionary());
 }
 
 TEST_F(FailureTest, needsNoPlaceForTheError) {
-  bus_.agent().kill();
+  agent_->kill();
   EXPECT_EQ(agents_.performCommand(identifier, KTHelperAgentDomainSystem, nullptr, "echo", {}, nullptr), std::nullopt);
   EXPECT_EQ(authorize(agents_), std::nullopt);
 }

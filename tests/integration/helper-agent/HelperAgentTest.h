@@ -1,6 +1,7 @@
 #pragma once
 
-#include "AgentBus.h"
+#include "support/ChildProgram.h"
+#include "support/SystemBus.h"
 
 #include <LumoraKit/platform/linux/DBusHelperAgent.h>
 
@@ -8,15 +9,21 @@
 
 namespace lumora::tests {
 
-/// An agent that trusts everyone, on a bus of its own.
+/// An agent with commands that go wrong, on a bus of its own.
 class HelperAgentTest : public testing::Test {
 protected:
   void SetUp() override {
-    if (const auto obstacle = AgentBus::obstacle()) {
+    if (const auto obstacle = SystemBus::obstacle()) {
       GTEST_SKIP() << *obstacle;
     }
     ASSERT_TRUE(bus_.start());
-    ASSERT_TRUE(bus_.startAgent());
+    ASSERT_TRUE(startAgent());
+  }
+
+  /// True when it has come up.
+  bool startAgent() {
+    agent_ = ChildProgram::startSelf({"--agent"});
+    return agent_ && agent_->readLine() == "ready";
   }
 
   static std::optional<Authorization> authorize(HelperAgent& agents, LMRErrorRef* error = nullptr) {
@@ -45,7 +52,8 @@ protected:
   }
 
   static inline const std::string identifier = "org.vantor.lumagentconfigd";
-  AgentBus bus_;
+  SystemBus bus_;
+  std::unique_ptr<ChildProgram> agent_;
   backend::DBusHelperAgent agents_;
 };
 

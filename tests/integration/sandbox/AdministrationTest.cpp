@@ -107,7 +107,8 @@ TEST(Administration, isStatus1_whenThereIsNoServer) {
   for (const auto& command : std::vector<std::vector<std::string>>{{"episodes", nowhere},
                                                                    {"user", "list", nowhere},
                                                                    {"workflow", "list", nowhere},
-                                                                   {"inject", "list", nowhere}}) {
+                                                                   {"inject", "list", nowhere},
+                                                                   {"agent", nowhere}}) {
     EXPECT_THAT(run(command), EndedWith(1, "there is no server at"));
   }
   EXPECT_FALSE(std::filesystem::exists(nowhere));

@@ -1,6 +1,6 @@
-#include "AgentBus.h"
+#include "SystemBus.h"
 
-#include "support/MainLoop.h"
+#include "MainLoop.h"
 
 #include <cstdlib>
 #include <filesystem>
@@ -19,39 +19,48 @@ constexpr const char* actionsFolder = "/usr/share/polkit-1/actions";
 constexpr const char* rulesFolder = "/etc/polkit-1/rules.d";
 constexpr const char* addressVariable = "DBUS_SYSTEM_BUS_ADDRESS";
 
-// A bus for everybody on this machine, as the real one is, but without its rules about who may serve what.
-std::string busConfiguration(const fs::path& socket) {
-  return R"(<!DOCTYPE busconfig PUBLIC "-//freedesktop//DTD D-BUS Bus Configuration 1.0//EN"
- "http://www.freedesktop.org/standards/dbus/1.0/busconfig.dtd">
-<busconfig>
-  <listen>unix:path=)" +
-         socket.string() + R"(</listen>
-  <auth>EXTERNAL</auth>
+constexpr const char* agentFolder = LUMORA_SOURCE_DIR "/sandbox/agent";
+
+constexpr const char* openPolicy = R"(
   <policy context="default">
     <allow user="*"/>
     <allow own="*"/>
     <allow send_destination="*" eavesdrop="false"/>
     <allow receive_sender="*"/>
+  </policy>)";
+
+// The rules of a machine's own bus, to which each service adds what it needs.
+constexpr const char* machinePolicy = R"(
+  <policy context="default">
+    <allow user="*"/>
+    <deny own="*"/>
+    <deny send_type="method_call"/>
+    <allow send_type="signal"/>
+    <allow send_requested_reply="true" send_type="method_return"/>
+    <allow send_requested_reply="true" send_type="error"/>
+    <allow receive_type="method_call"/>
+    <allow receive_type="method_return"/>
+    <allow receive_type="error"/>
+    <allow receive_type="signal"/>
+    <allow send_destination="org.freedesktop.DBus" send_interface="org.freedesktop.DBus"/>
   </policy>
-</busconfig>
-)";
+  <include ignore_missing="yes">/usr/share/dbus-1/system.d/org.freedesktop.PolicyKit1.conf</include>
+  <include>)";
+
+std::string rules(SystemBus::Policy policy) {
+  return policy == SystemBus::Policy::Open
+             ? openPolicy
+             : std::string(machinePolicy) + agentFolder + "/org.vantor.lumagentconfigd.conf</include>";
 }
 
-constexpr const char* agentPolicy = R"(<?xml version="1.0" encoding="UTF-8"?>
-<!DOCTYPE policyconfig PUBLIC "-//freedesktop//DTD PolicyKit Policy Configuration 1.0//EN"
- "http://www.freedesktop.org/standards/PolicyKit/1/policyconfig.dtd">
-<policyconfig>
-  <action id="org.vantor.lumagentconfigd.configure">
-    <description>Configure camera sharing</description>
-    <message>Authentication is required</message>
-    <defaults>
-      <allow_any>auth_admin</allow_any>
-      <allow_inactive>auth_admin</allow_inactive>
-      <allow_active>auth_admin</allow_active>
-    </defaults>
-  </action>
-</policyconfig>
-)";
+// A bus for everybody on this machine, as the real one is.
+std::string busConfiguration(const fs::path& socket, SystemBus::Policy policy) {
+  return R"(<!DOCTYPE busconfig PUBLIC "-//freedesktop//DTD D-BUS Bus Configuration 1.0//EN"
+ "http://www.freedesktop.org/standards/dbus/1.0/busconfig.dtd">
+<busconfig>
+  <listen>unix:path=)" +
+         socket.string() + "</listen>\n  <auth>EXTERNAL</auth>" + rules(policy) + "\n</busconfig>\n";
+}
 
 std::string ruleFor(const std::string& user) {
   return R"(polkit.addRule(function(action, subject) {
@@ -65,11 +74,11 @@ std::string ruleFor(const std::string& user) {
 
 } // namespace
 
-std::optional<std::string> AgentBus::obstacle() {
+std::optional<std::string> SystemBus::obstacle() {
   return fs::exists(busProgram) ? std::nullopt : std::optional<std::string>("there is no dbus-daemon");
 }
 
-std::optional<std::string> AgentBus::polkitObstacle() {
+std::optional<std::string> SystemBus::polkitObstacle() {
   if (!fs::exists(polkitProgram)) {
     return "there is no polkitd";
   }
@@ -84,39 +93,33 @@ std::optional<std::string> AgentBus::polkitObstacle() {
   return std::nullopt;
 }
 
-AgentBus::AgentBus() {
+SystemBus::SystemBus(Policy policy) {
   // Other users reach the socket, and polkit's own user its files.
   fs::permissions(folder_.path(), fs::perms(0755));
-  writeFile(folder_ / "bus.conf", busConfiguration(folder_ / "bus"));
+  writeFile(folder_ / "bus.conf", busConfiguration(folder_ / "bus", policy));
   ::setenv(addressVariable, ("unix:path=" + (folder_ / "bus").string()).c_str(), 1);
 }
 
-AgentBus::~AgentBus() {
+SystemBus::~SystemBus() {
   ::unsetenv(addressVariable);
 }
 
-bool AgentBus::start() {
+bool SystemBus::start() {
   bus_ = ChildProgram::start(
       {busProgram, "--nofork", "--nopidfile", "--print-address=1", "--config-file=" + (folder_ / "bus.conf").string()});
   return bus_ && !bus_->readLine().empty();
 }
 
-void AgentBus::stop() {
+void SystemBus::stop() {
   bus_->kill();
 }
 
-bool AgentBus::startAgent(std::vector<std::string> arguments) {
-  arguments.insert(arguments.begin(), "--agent");
-  agent_ = ChildProgram::startSelf(std::move(arguments));
-  return agent_ && agent_->readLine() == "ready";
-}
-
-bool AgentBus::startPolkit(const std::string& allowedUser) {
+bool SystemBus::startPolkit(const std::string& allowedUser) {
   const fs::path actions = folder_ / "actions";
   const fs::path rules = folder_ / "rules";
   fs::create_directories(actions);
   fs::create_directories(rules);
-  writeFile(actions / "org.vantor.lumagentconfigd.policy", agentPolicy);
+  fs::copy(fs::path(agentFolder) / "org.vantor.lumagentconfigd.policy", actions);
   writeFile(rules / "10-test.rules", ruleFor(allowedUser));
   for (const auto& entry : fs::recursive_directory_iterator(folder_.path())) {
     fs::permissions(entry.path(),
@@ -129,7 +132,7 @@ bool AgentBus::startPolkit(const std::string& allowedUser) {
   return polkit_ && waitForService("org.freedesktop.PolicyKit1");
 }
 
-bool AgentBus::waitForService(const std::string& service) {
+bool SystemBus::waitForService(const std::string& service) {
   const auto limit = std::chrono::steady_clock::now() + generousLimit;
   while (std::chrono::steady_clock::now() < limit) {
     const auto probe =

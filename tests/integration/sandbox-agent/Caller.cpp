@@ -37,14 +37,15 @@ bool becomeUser(const std::string& number) {
   return user == getuid() || (setgroups(0, nullptr) == 0 && setgid(user) == 0 && setuid(user) == 0);
 }
 
-void change(const Authorization& authorization) {
+void change(const Authorization& authorization, const std::string& value) {
   const auto action = LMRActionFactory::actionToSetRemoteRecorderConfigurationValue_forKey_authorization(
-      "high", "Capture", &authorization);
+      value, std::string(LMRRemoteRecorderQualityDeviceKey), &authorization);
   action->runSynchronously();
   if (const auto error = action->error()) {
     std::cout << "failed " << error->code() << std::endl;
   } else {
-    std::cout << "succeeded " << action->result()->string("changed").value_or("nothing") << std::endl;
+    std::cout << "succeeded " << action->result()->string(LMRRemoteRecorderQualityDeviceKey).value_or("nothing")
+              << std::endl;
   }
 }
 
@@ -70,7 +71,7 @@ int runCaller(const std::vector<std::string>& arguments) {
   std::cout << "authorized " << digitsOf(authorization->bytes) << std::endl;
   std::string line;
   std::getline(std::cin, line);
-  change(*authorization);
+  change(*authorization, line);
   return EXIT_SUCCESS;
 }
 
