@@ -52,6 +52,7 @@
 #include <LumoraKit/recording/LMRLocalAudioRecorder.h>
 #include <LumoraKit/recording/LMRLocalScreenRecorder.h>
 #include <LumoraKit/recording/LMRLocalVideoRecorder.h>
+#include <LumoraKit/recording/LMRMultipleSourceRecorder.h>
 #include <LumoraKit/recording/LMRRecorderClasses.h>
 #include <LumoraKit/recording/LMRRemoteAudioRecorder.h>
 #include <LumoraKit/recording/LMRRemoteVideoRecorder.h>

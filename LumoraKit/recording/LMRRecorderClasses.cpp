@@ -1,6 +1,7 @@
 #include <LumoraKit/recording/LMRLocalAudioRecorder.h>
 #include <LumoraKit/recording/LMRLocalScreenRecorder.h>
 #include <LumoraKit/recording/LMRLocalVideoRecorder.h>
+#include <LumoraKit/recording/LMRMultipleSourceRecorder.h>
 #include <LumoraKit/recording/LMRRecorderClasses.h>
 #include <LumoraKit/recording/LMRRemoteAudioRecorder.h>
 #include <LumoraKit/recording/LMRRemoteVideoRecorder.h>
@@ -17,8 +18,11 @@ template <class Recorder> std::pair<const std::string, lumora::KeyedUnarchiver::
 
 lumora::KeyedUnarchiver::ClassTable LMRRecorderClasses() {
   return {
-      entry<LMRLocalVideoRecorder>("LMRLocalVideoRecorder"),   entry<LMRLocalAudioRecorder>("LMRLocalAudioRecorder"),
-      entry<LMRLocalScreenRecorder>("LMRLocalScreenRecorder"), entry<LMRRemoteVideoRecorder>("LMRRemoteVideoRecorder"),
+      entry<LMRLocalVideoRecorder>("LMRLocalVideoRecorder"),
+      entry<LMRLocalAudioRecorder>("LMRLocalAudioRecorder"),
+      entry<LMRLocalScreenRecorder>("LMRLocalScreenRecorder"),
+      entry<LMRRemoteVideoRecorder>("LMRRemoteVideoRecorder"),
       entry<LMRRemoteAudioRecorder>("LMRRemoteAudioRecorder"),
+      entry<LMRMultipleSourceRecorder>("LMRMultipleSourceRecorder"),
   };
 }
