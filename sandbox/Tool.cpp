@@ -2,6 +2,7 @@
 
 #include "Status.h"
 #include "Strike.h"
+#include "TicketProgram.h"
 #include "commands/Command.h"
 
 #include <LumoraKit/platform/PropertyList.h>
@@ -25,19 +26,14 @@ Outcome outcomeOf(const Dictionary& reply, const Damage& damage) {
   return outcome;
 }
 
-/// Single sign-on is always the one user that the server was set up with; there is no ticket to be checked.
-std::optional<User> singleSignOnUser(Store& store) {
-  const auto name = store.setting("kerberos_user");
-  return name ? findUser(store, *name) : std::nullopt;
-}
-
 User logIn(Store& store, const Credentials& credentials) {
   checkAddress(store, credentials.server);
-  const auto user =
-      credentials.user ? authenticate(store, *credentials.user, credentials.password) : singleSignOnUser(store);
+  if (!credentials.user) {
+    return userWithTicket(store);
+  }
+  const auto user = authenticate(store, *credentials.user, credentials.password);
   if (!user) {
-    throw Refusal(Status::NotAuthorized,
-                  credentials.user ? "wrong user name or password" : "the server offers no single sign-on");
+    throw Refusal(Status::NotAuthorized, "wrong user name or password");
   }
   return *user;
 }

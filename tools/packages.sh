@@ -2,7 +2,7 @@
 
 build_packages=(
   g++ cmake ninja-build ccache pkg-config
-  libglib2.0-dev libexpat1-dev libpugixml-dev libsqlite3-dev libsqlitecpp-dev libsodium-dev libcli11-dev libpng-dev
+  libglib2.0-dev libexpat1-dev libpugixml-dev libsqlite3-dev libsqlitecpp-dev libsodium-dev libcli11-dev libpng-dev libkrb5-dev
   libgstreamer1.0-dev libgstreamer-plugins-base1.0-dev
   libgtest-dev libgmock-dev
 )
@@ -17,7 +17,7 @@ run_packages=(
 headless_packages=(dbus pipewire pipewire-bin pipewire-pulse wireplumber libspa-0.2-modules xvfb)
 
 demo_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
-test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg polkitd)
+test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg polkitd krb5-kdc krb5-admin-server krb5-user)
 bench_packages=(libbenchmark-dev gstreamer1.0-tools bsdextrautils)
 check_packages=(clang-format-14 git)
 lint_packages=(clang-14 clang-tidy-14 libclang-rt-14-dev python3)

@@ -49,6 +49,7 @@ int administrate(int argc, char** argv) {
   addWorkflowCommands(program);
   addCameraCommands(program);
   addMasterPasswordCommand(program);
+  addSingleSignOnCommands(program);
   addEpisodesCommand(program);
   addInjectCommand(program);
   addAgentCommand(program);

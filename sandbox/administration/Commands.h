@@ -14,6 +14,7 @@ void addUserCommands(CLI::App& program);
 void addWorkflowCommands(CLI::App& program);
 void addCameraCommands(CLI::App& program);
 void addMasterPasswordCommand(CLI::App& program);
+void addSingleSignOnCommands(CLI::App& program);
 void addEpisodesCommand(CLI::App& program);
 void addInjectCommand(CLI::App& program);
 void addAgentCommand(CLI::App& program);

@@ -18,7 +18,6 @@ struct Options {
   std::string passwordFile;
   std::uint16_t port = 8170;
   bool isLibraryServer = false;
-  std::string kerberosUser;
   std::string version = "2.0.1";
 };
 
@@ -30,9 +29,6 @@ void set(Store& store, const Options& options) {
   store.setSetting("port", std::to_string(options.port));
   store.setSetting("server_kind", options.isLibraryServer ? "LumoraLibrary" : "LumoraServer");
   store.setSetting("server_version", options.version);
-  if (!options.kerberosUser.empty()) {
-    store.setSetting("kerberos_user", options.kerberosUser);
-  }
 }
 
 void create(const Options& options) {
@@ -62,8 +58,6 @@ void addCreateCommand(CLI::App& program) {
   addPasswordOption(command, options->passwordFile);
   command.add_option("--port", options->port, "port that the server answers at")->capture_default_str();
   command.add_flag("--library-server", options->isLibraryServer, "be a library server");
-  command.add_option("--kerberos-user", options->kerberosUser,
-                     "offer single sign-on: whoever uses it is this user, whatever the ticket");
   command.add_option("--server-version", options->version, "version that the server tells")->capture_default_str();
   command.callback([options] { create(*options); });
 }

@@ -1,4 +1,5 @@
 #include "../store/Recordings.h"
+#include "../store/SingleSignOn.h"
 #include "Command.h"
 
 #include <sstream>
@@ -22,7 +23,7 @@ Dictionary listInfo(Context& context, const Arguments& arguments) {
   const Address address = parseAddress(arguments.text("server"));
   checkAddress(context.store, address);
   Array types = words(context.store.setting("auth_types", "basic digest"));
-  if (context.store.setting("kerberos_user")) {
+  if (singleSignOnService(context.store)) {
     types.emplace_back("kerberos");
   }
   return {{"http_auth_type", std::move(types)},

@@ -14,12 +14,13 @@ namespace fs = std::filesystem;
 namespace {
 
 constexpr std::chrono::milliseconds busyTimeout{60'000};
-constexpr int schemaVersion = 2;
+constexpr int schemaVersion = 3;
 
 constexpr const char* schema = R"sql(
 CREATE TABLE settings (key TEXT PRIMARY KEY, value TEXT NOT NULL);
 CREATE TABLE users (
   name TEXT PRIMARY KEY, full_name TEXT NOT NULL, password_hash TEXT NOT NULL);
+CREATE TABLE principals (principal TEXT PRIMARY KEY, user TEXT NOT NULL);
 CREATE TABLE workflows (
   uuid TEXT PRIMARY KEY, name TEXT NOT NULL UNIQUE, title TEXT NOT NULL, sources TEXT NOT NULL,
   is_protected INTEGER NOT NULL, added INTEGER NOT NULL);
@@ -47,12 +48,12 @@ CREATE TABLE faults (
   message TEXT, remaining INTEGER);
 )sql";
 
-fs::path stateFolder(const fs::path& root) {
+fs::path stateFolderBelow(const fs::path& root) {
   return root / "var" / "lib" / "lumora";
 }
 
 fs::path databasePath(const fs::path& root) {
-  return stateFolder(root) / "server.sqlite";
+  return stateFolderBelow(root) / "server.sqlite";
 }
 
 /// A change takes a fraction of a millisecond; SQLite's own handler would soon wait a tenth of a second for one.
@@ -89,7 +90,7 @@ Store Store::create(const fs::path& root) {
   fs::create_directories(store.submissionsFolder());
   fs::create_directories(store.incomingFolder());
   fs::create_directories(store.previewsFolder());
-  fs::permissions(stateFolder(store.root_), fs::perms::owner_all);
+  fs::permissions(store.stateFolder(), fs::perms::owner_all);
   store.database_ = openDatabase(store.root_, SQLite::OPEN_READWRITE | SQLite::OPEN_CREATE);
   store.database_->exec("PRAGMA journal_mode = WAL");
   store.change([&] {
@@ -117,16 +118,20 @@ void Store::resume() {
   database_ = openDatabase(root_, SQLite::OPEN_READWRITE);
 }
 
+fs::path Store::stateFolder() const {
+  return stateFolderBelow(root_);
+}
+
 fs::path Store::submissionsFolder() const {
-  return stateFolder(root_) / "submissions";
+  return stateFolder() / "submissions";
 }
 
 fs::path Store::incomingFolder() const {
-  return stateFolder(root_) / "incoming";
+  return stateFolder() / "incoming";
 }
 
 fs::path Store::previewsFolder() const {
-  return stateFolder(root_) / "previews";
+  return stateFolder() / "previews";
 }
 
 void Store::change(const std::function<void()>& change) {

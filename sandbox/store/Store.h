@@ -23,6 +23,8 @@ public:
   static bool existsAt(const std::filesystem::path& root);
 
   const std::filesystem::path& root() const { return root_; }
+  /// Where everything lies that the server knows, for its owner alone.
+  std::filesystem::path stateFolder() const;
   /// Where filed submissions lie, one folder each.
   std::filesystem::path submissionsFolder() const;
   /// Where files are copied to before they are filed.

@@ -30,12 +30,6 @@ TEST(ListInfo, tellsAuthenticationAndVersion) {
   EXPECT_EQ(reply.string("server_version"), "2.0.1");
 }
 
-TEST(ListInfo, offersKerberos_whenTheServerHasSingleSignOn) {
-  const SandboxServer server({"--kerberos-user", "ada"});
-  const auto reply = replyTo(server.request(listInfo("localhost:8170")));
-  EXPECT_EQ(*reply.array("http_auth_type"), (Array{"basic", "digest", "kerberos"}));
-}
-
 TEST(ListInfo, answersUnderEachOfTheServersNames) {
   const SandboxServer server;
   std::string machine(256, '\0');
@@ -117,13 +111,6 @@ TEST(Login, isStatus26_whenTheServerHasNoSingleSignOn) {
   const SandboxServer server;
   EXPECT_THAT(server.request({Array{"server", "localhost:8170"}, Array{"auth", "Kerberos"}, "listworkflows"}),
               EndedWith(26, "no single sign-on"));
-}
-
-TEST(Login, namesTheUser_whenTheServerHasSingleSignOn) {
-  const SandboxServer server({"--kerberos-user", "ada"});
-  const auto reply =
-      replyTo(server.request({Array{"server", "localhost:8170"}, Array{"auth", "Kerberos"}, "listworkflows"}));
-  EXPECT_EQ(reply.string("user_shortname"), "ada");
 }
 
 TEST(Login, addressIsCheckedBeforeThePassword) {
