@@ -5,12 +5,6 @@
 
 #include <string_view>
 
-// The system's libraries have no frame pointers: without this the suppressions of their leaks match nothing.
-extern "C" __attribute__((visibility("default"))) const char* __asan_default_options();
-extern "C" const char* __asan_default_options() {
-  return "fast_unwind_on_malloc=0";
-}
-
 int main(int argc, char** argv) {
   if (argc == 3 && std::string_view(argv[1]) == lumora::testing::recordUntilKilledSwitch) {
     return lumora::testing::recordUntilKilled(argv[2]);
