@@ -19,7 +19,7 @@ headless_packages=(dbus pipewire pipewire-bin pipewire-pulse wireplumber libspa-
 demo_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
 test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg polkitd krb5-kdc krb5-admin-server krb5-user)
 bench_packages=(libbenchmark-dev gstreamer1.0-tools bsdextrautils)
-check_packages=(clang-format-14 git)
+check_packages=(clang-format-14 git python3)
 lint_packages=(clang-14 clang-tidy-14 libclang-rt-14-dev python3)
 
 # install_packages NAME...: installs those that are missing, and says nothing when none is.

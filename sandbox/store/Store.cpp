@@ -2,10 +2,15 @@
 
 #include <sqlite3.h>
 
+#include <cerrno>
 #include <chrono>
 #include <ctime>
 #include <stdexcept>
 #include <thread>
+
+#include <fcntl.h>
+#include <sys/file.h>
+#include <unistd.h>
 
 namespace lumora::sandbox {
 
@@ -73,6 +78,22 @@ std::unique_ptr<SQLite::Database> openDatabase(const fs::path& root, int flags) 
   return database;
 }
 
+/// The right to change, for one process at a time. The kernel wakes whoever waits: dozens of processes that ask SQLite
+/// for its lock again and again would cost more than all that they do.
+class Turn {
+public:
+  explicit Turn(const fs::path& folder) : lock_(open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC)) {
+    while (flock(lock_, LOCK_EX) != 0 && errno == EINTR) {
+    }
+  }
+  Turn(const Turn&) = delete;
+  Turn& operator=(const Turn&) = delete;
+  ~Turn() { close(lock_); }
+
+private:
+  int lock_;
+};
+
 } // namespace
 
 Store::Store(fs::path root) : root_(std::move(root)) {}
@@ -135,6 +156,7 @@ fs::path Store::previewsFolder() const {
 }
 
 void Store::change(const std::function<void()>& change) {
+  const Turn turn(stateFolder());
   // Immediate: a transaction that reads first and writes later could not wait for another writer.
   SQLite::Transaction transaction(*database_, SQLite::TransactionBehavior::IMMEDIATE);
   change();
