@@ -49,7 +49,7 @@ template <class Function> void forEachCharacter(std::string_view text, const Fun
   for (const char* at = text.data(); at < end;) {
     const gunichar character = g_utf8_get_char_validated(at, end - at);
     const bool isValid = character < 0x110000;
-    const char* const next = isValid ? g_utf8_next_char(at) : at + 1;
+    const char* const next = at + (isValid ? g_unichar_to_utf8(character, nullptr) : 1);
     function(isValid ? character : gunichar{0xFFFD},
              isValid ? std::string_view(at, static_cast<std::size_t>(next - at)) : std::string_view("\xEF\xBF\xBD"));
     at = next;
