@@ -47,7 +47,8 @@ bool isHidden(gunichar character) {
 template <class Function> void forEachCharacter(std::string_view text, const Function& function) {
   const char* const end = text.data() + text.size();
   for (const char* at = text.data(); at < end;) {
-    const gunichar character = g_utf8_get_char_validated(at, end - at);
+    // The library takes a zero byte for the end of the text.
+    const gunichar character = *at == '\0' ? 0 : g_utf8_get_char_validated(at, end - at);
     const bool isValid = character < 0x110000;
     const char* const next = at + (isValid ? g_unichar_to_utf8(character, nullptr) : 1);
     function(isValid ? character : gunichar{0xFFFD},
