@@ -1,10 +1,12 @@
 #include "ClientTest.h"
+#include "support/TestKDC.h"
 
 #include <LumoraKit/actions/LMRToolPaths.h>
 
 using lumora::Array;
 using lumora::tests::FailedWith;
 using lumora::tests::pair;
+using lumora::tests::TestKDC;
 using testing::HasSubstr;
 
 namespace {
@@ -72,18 +74,34 @@ TEST_F(InformationTest, toolIsMissing_whenTheRootHasNone) {
   EXPECT_THAT(run({"info", "--root", folder_.path().string()}), FailedWith(127, "No such file or directory"));
 }
 
+/// With a Kerberos server, and a ticket for whoever asks.
 class SingleSignOnTest : public lumora::tests::ClientTest {
 protected:
-  SingleSignOnTest() : ClientTest({"--kerberos-user", "ada"}) {}
+  void SetUp() override {
+    if (const auto obstacle = TestKDC::obstacle()) {
+      GTEST_SKIP() << *obstacle;
+    }
+    ASSERT_TRUE(kerberos_.start());
+    kerberos_.addUser("ada", "tickets");
+    const auto keytab = kerberos_.addService("lumora/localhost").string();
+    ASSERT_EQ(server_.administrate({"single-sign-on", "enable"}, {"--keytab", keytab}).status, 0);
+    const auto principal = std::string("ada@") + TestKDC::realm;
+    ASSERT_EQ(server_.administrate({"single-sign-on", "map"}, {principal, "ada"}).status, 0);
+  }
   static lumora::tests::ProgramRun runPlainly(std::vector<std::string> arguments) {
     arguments.insert(arguments.begin(), LUMORA_CLIENT_PROGRAM);
     return lumora::tests::runToEnd(arguments);
   }
+
+  TestKDC kerberos_;
 };
 
 TEST_F(SingleSignOnTest, ticketLogsIn_whenKerberosIsAskedFor) {
+  EXPECT_THAT(runPlainly({"login", "--kerberos"}), FailedWith(26, "Not authorized"));
+  ASSERT_TRUE(kerberos_.logIn("ada", "tickets"));
   const auto login = runPlainly({"login", "--kerberos"});
   EXPECT_EQ(login.status, 0) << login.standardError;
+  EXPECT_THAT(login.standardOutput, testing::StartsWith("User            ada\n"));
   EXPECT_THAT(login.standardOutput, HasSubstr("Logged in by    kerberos\n"));
   EXPECT_EQ(runPlainly({"workflows", "--kerberos"}).status, 0);
 }
