@@ -16,6 +16,9 @@ struct Options {
 
 void add(const Options& options) {
   Store store = Store::open(options.root);
+  if (options.name.empty()) {
+    throw std::runtime_error("the camera's name is empty");
+  }
   store.change([&] {
     addCamera(store, options.name, false);
     updatePreview(store, findCamera(store, options.name).value());

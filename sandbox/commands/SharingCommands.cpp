@@ -16,6 +16,9 @@ std::string quoted(const std::string& text) {
 }
 
 void bind(Context& context, const std::string& name) {
+  if (name.empty()) {
+    throw Refusal(Status::InvalidArguments, "the camera's name is empty");
+  }
   if (const auto bound = boundCamera(context.store)) {
     refuse("this machine's camera is shared as " + quoted(bound->name) + " already");
   }

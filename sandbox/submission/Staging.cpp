@@ -84,6 +84,17 @@ StoredFile Staging::add(const fs::path& source, const Pace& pace) {
   return {name, storedName, copied.size, copied.sha256};
 }
 
+// Numbered, because files from several folders may have one name. A file system takes names of 255 bytes: of a longer
+// one the end is kept, from the beginning of a character on (UTF-8).
+std::string Staging::nextName(const std::string& name) {
+  constexpr std::size_t most = 200;
+  std::size_t begin = name.size() > most ? name.size() - most : 0;
+  while (begin < name.size() && begin > 0 && (static_cast<unsigned char>(name[begin]) & 0xC0U) == 0x80U) {
+    ++begin;
+  }
+  return std::to_string(++count_) + "-" + name.substr(begin);
+}
+
 StoredFile Staging::addContent(const std::string& name, const std::string& content) {
   const std::string storedName = nextName(name);
   const Copied copied = writeContent(content, folder_ / storedName);

@@ -31,8 +31,7 @@ public:
 
 private:
   bool makeFolder();
-  /// Numbered, because files from several folders may have one name.
-  std::string nextName(const std::string& name) { return std::to_string(++count_) + "-" + name; }
+  std::string nextName(const std::string& name);
 
   const Store& store_;
   std::string uuid_;

@@ -5,6 +5,8 @@
 #include <LumoraKit/platform/Platform.h>
 #include <LumoraKit/platform/RootedToolRunner.h>
 
+#include <cstdlib>
+
 using lumora::Platform;
 using lumora::tests::SandboxServer;
 
@@ -17,8 +19,12 @@ protected:
     auto platform = previous_;
     platform.toolRunner = std::make_shared<lumora::RootedToolRunner>(server_.root(), previous_.toolRunner);
     Platform::install(platform);
+    ::setenv("XDG_DATA_HOME", (server_.folder() / "data").c_str(), 1);
   }
-  ~EpisodeTest() override { Platform::install(previous_); }
+  ~EpisodeTest() override {
+    ::unsetenv("XDG_DATA_HOME");
+    Platform::install(previous_);
+  }
 
   static std::shared_ptr<LMRAuthenticationAction> logInToServer() {
     auto login = LMRAuthenticationAction::actionWithServer_port(SandboxServer::host, SandboxServer::port);
