@@ -153,7 +153,8 @@ public:
   /// Takes effect with the next file.
   virtual void setCompressionOptions_forConnection(const CompressionOptions& options,
                                                    const std::shared_ptr<CaptureConnection>& connection) = 0;
-  /// Begins to write that file, or, without one, finishes the current file.
+  /// Begins to write that file, or, without one, finishes the current file. Asked for the file that it is writing or
+  /// finishing, it goes on with that as if it had not been asked: nothing is written over a recording.
   virtual void recordToOutputFileURL(const std::optional<std::filesystem::path>& file) = 0;
   virtual void pauseRecording() = 0;
   virtual void resumeRecording() = 0;

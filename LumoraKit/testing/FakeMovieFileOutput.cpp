@@ -45,6 +45,9 @@ void FakeMovieFileOutput::setCompressionOptions_forConnection(const CompressionO
 void FakeMovieFileOutput::recordToOutputFileURL(const std::optional<std::filesystem::path>& file) {
   const std::lock_guard lock(mutex_);
   requests_.push_back(file ? "record " + file->string() : "finish");
+  if (file && file == outputFileURL_) {
+    return;
+  }
   finish(nullptr);
   if (file) {
     state_ = State::Recording;

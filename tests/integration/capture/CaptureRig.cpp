@@ -1,6 +1,6 @@
 #include "CaptureRig.h"
 
-#include "Movie.h"
+#include "support/Movie.h"
 
 #include <LumoraKit/platform/Platform.h>
 

@@ -1,5 +1,5 @@
 #include "CaptureRig.h"
-#include "Movie.h"
+#include "support/Movie.h"
 
 #include <csignal>
 #include <thread>

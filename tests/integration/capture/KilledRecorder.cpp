@@ -1,7 +1,7 @@
 #include "KilledRecorder.h"
 
 #include "CaptureRig.h"
-#include "Movie.h"
+#include "support/Movie.h"
 
 #include <LumoraKit/platform/Platform.h>
 

@@ -1,5 +1,5 @@
 #include "CaptureRig.h"
-#include "Movie.h"
+#include "support/Movie.h"
 
 #include <algorithm>
 #include <cmath>
@@ -149,6 +149,24 @@ TEST_F(Recording, nextFileBeginsWhereTheFirstEnds_whenAnotherIsBegunWhileRecordi
   ASSERT_TRUE(delegate_->waitForEnd(file("b.mov")));
   expectTimes(Movie(file("a.mov")).times("v"), shown(start, change, 0));
   expectTimes(Movie(file("b.mov")).times("v"), shown(change, stop, 0));
+}
+
+TEST_F(Recording, goesOnWithItsFile_whenAskedForItAgainWhileItIsWrittenOrFinished) {
+  addCameraAndMicrophone();
+  run();
+  const HostTime start = startAtNextPicture(file("a.mov"));
+  const HostTime again = startAtNextPicture(file("a.mov"));
+  std::this_thread::sleep_for(1s);
+  startAtNextPicture(file("a.mov"));
+  const HostTime stop = delegate_->atNext(MediaType::Video, [&](MovieFileOutput& output) {
+    output.recordToOutputFileURL(std::nullopt);
+    output.recordToOutputFileURL(file("a.mov"));
+  });
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  EXPECT_EQ(delegate_->events(file("a.mov")), "did-start will-finish did-finish");
+  EXPECT_LT(start, again);
+  EXPECT_NEAR(Movie(file("a.mov")).duration(), seconds(stop - start), 0.05);
+  EXPECT_EQ(output_->outputFileURL(), std::nullopt);
 }
 
 TEST_F(Recording, finishesWithAnError_whenStoppedBeforeTheFirstSample) {

@@ -54,6 +54,27 @@ TEST_F(Outcome, followsTheOutputsReports_throughPauseAndResumeAndStop) {
   EXPECT_EQ(*recorder_->recordingStopDate() - *recorder_->recordingStartDate(), 7s);
 }
 
+TEST_F(Outcome, goesOnWithItsFile_whenStartedAgainBeforeTheOutputReportsTheStart) {
+  recorder_->bootstrap();
+  recorder_->start();
+  sample(1001);
+  recorder_->start();
+  sample(1002);
+  EXPECT_THAT(output().requests(), ElementsAre(recordRequest(), recordRequest()));
+  EXPECT_EQ(output().deliverOutcomes(), 1);
+  EXPECT_THAT(delegate_->selectors(), ElementsAre("recorderDidStartRecording:"));
+}
+
+TEST_F(Outcome, finishesItsFile_whenASampleTakesASecondStartAfterTheStop) {
+  beginWriting();
+  recorder_->start();
+  recorder_->stop();
+  sample(2001);
+  output().deliverOutcomes();
+  EXPECT_THAT(delegate_->selectors(), ElementsAre("recorderDidStartRecording:", "recorderDidStopRecording:"));
+  EXPECT_EQ(output().outputFileURL(), std::nullopt);
+}
+
 TEST_F(Outcome, isStoppedWithItsFileAndWithoutItsOutput_whenStopped) {
   beginWriting();
   const auto path = file();

@@ -53,6 +53,9 @@ void FileOutput::recordToOutputFileURL(const std::optional<std::filesystem::path
   std::shared_ptr<Recording> next;
   {
     const std::lock_guard lock(mutex_);
+    if (current_ && file == current_->plan().file) {
+      return;
+    }
     if (current_) {
       current_->finish(time, nullptr);
     }

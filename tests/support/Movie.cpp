@@ -29,6 +29,10 @@ Result shell(const std::string& command) {
 
 } // namespace
 
+bool Movie::canBeRead() {
+  return shell("command -v ffprobe && command -v ffmpeg").status == 0;
+}
+
 bool Movie::decodes() const {
   const Result result = shell("ffmpeg -v error -xerror -i '" + file_.string() + "' -fps_mode vfr -f null - 2>&1");
   std::fputs(result.output.c_str(), stderr);

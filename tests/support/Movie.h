@@ -9,6 +9,9 @@ namespace lumora::testing {
 /// What ffprobe and ffmpeg say of a movie file.
 class Movie {
 public:
+  /// Whether both are installed.
+  static bool canBeRead();
+
   explicit Movie(std::filesystem::path file) : file_(std::move(file)) {}
 
   /// Whether every packet decodes without a complaint.
