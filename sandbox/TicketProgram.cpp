@@ -21,6 +21,7 @@ namespace {
 
 pid_t start(const std::string& program, std::vector<std::string> arguments, int output) {
   std::vector<char*> vector;
+  vector.reserve(arguments.size() + 1);
   for (auto& argument : arguments) {
     vector.push_back(argument.data());
   }
@@ -58,7 +59,7 @@ std::string runTicketProgram(const std::vector<std::string>& words) {
   arguments.insert(arguments.end(), words.begin(), words.end());
   const pid_t process = start(program, arguments, pipe[1]);
   close(pipe[1]);
-  const std::string line = readLine(pipe[0]);
+  std::string line = readLine(pipe[0]);
   close(pipe[0]);
   int status = 0;
   waitpid(process, &status, 0);

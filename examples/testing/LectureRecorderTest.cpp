@@ -7,7 +7,6 @@
 #include <gtest/gtest.h>
 
 using lumora::Array;
-using lumora::Dictionary;
 using lumora::MediaType;
 using lumora::fakes::ToolReply;
 

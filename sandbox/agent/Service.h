@@ -2,7 +2,6 @@
 
 #include <gio/gio.h>
 
-#include <optional>
 #include <string>
 
 /// \file

@@ -96,7 +96,7 @@ using AuthContext = Owned<krb5_auth_context>;
 class Message {
 public:
   Message(const Library& library, krb5_principal service) : library_(library) {
-    const auto context = library_.context();
+    auto* const context = library_.context();
     Owned<krb5_ccache> cache(context, freed<krb5_cc_close, krb5_ccache>);
     Principal caller(context, krb5_free_principal);
     library_.check(krb5_cc_default(context, cache.place()), "there is no Kerberos ticket");
@@ -124,7 +124,7 @@ private:
 
 /// The name of the one whom the message's ticket was given to.
 std::string sender(const Library& library, const Message& message, krb5_principal service, const std::string& path) {
-  const auto context = library.context();
+  auto* const context = library.context();
   Keytab keytab(context, freed<krb5_kt_close, krb5_keytab>);
   library.check(krb5_kt_resolve(context, ("FILE:" + path).c_str(), keytab.place()), Status::UnknownServerError,
                 "the server's keytab cannot be read");
@@ -152,24 +152,24 @@ bool isService(krb5_const_principal principal) {
 
 } // namespace
 
-std::string serviceInKeytab(const std::string& path) {
+std::string serviceInKeytab(const std::string& keytab) {
   const Library library;
-  const auto context = library.context();
-  Keytab keytab(context, freed<krb5_kt_close, krb5_keytab>);
-  library.check(krb5_kt_resolve(context, ("FILE:" + path).c_str(), keytab.place()), path);
+  auto* const context = library.context();
+  Keytab keys(context, freed<krb5_kt_close, krb5_keytab>);
+  library.check(krb5_kt_resolve(context, ("FILE:" + keytab).c_str(), keys.place()), keytab);
   krb5_kt_cursor cursor{};
-  library.check(krb5_kt_start_seq_get(context, keytab.get(), &cursor), path);
+  library.check(krb5_kt_start_seq_get(context, keys.get(), &cursor), keytab);
   std::string service;
-  for (krb5_keytab_entry entry{}; service.empty() && krb5_kt_next_entry(context, keytab.get(), &entry, &cursor) == 0;) {
+  for (krb5_keytab_entry entry{}; service.empty() && krb5_kt_next_entry(context, keys.get(), &entry, &cursor) == 0;) {
     if (isService(entry.principal)) {
       service = library.name(entry.principal);
     }
     krb5_free_keytab_entry_contents(context, &entry);
   }
-  krb5_kt_end_seq_get(context, keytab.get(), &cursor);
+  krb5_kt_end_seq_get(context, keys.get(), &cursor);
   if (service.empty()) {
     throw TicketRefusal(static_cast<int>(Status::InvalidArguments),
-                        path + ": there is no key of a service lumora/HOST");
+                        keytab + ": there is no key of a service lumora/HOST");
   }
   return service;
 }

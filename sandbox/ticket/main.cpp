@@ -7,7 +7,6 @@
 #include "../Status.h"
 #include "Kerberos.h"
 
-#include <array>
 #include <csignal>
 #include <iostream>
 #include <string>
