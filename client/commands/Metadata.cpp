@@ -5,7 +5,7 @@
 
 #include <filesystem>
 #include <fstream>
-#include <iterator>
+#include <sstream>
 
 namespace lumora::client {
 
@@ -13,9 +13,13 @@ namespace {
 
 Dictionary metadataFile(const std::string& path) {
   std::ifstream file(readableFile(path), std::ios::binary);
-  const std::string content((std::istreambuf_iterator<char>(file)), {});
+  if (std::filesystem::is_directory(path)) {
+    throw Failure(exitNoInput, inQuotes(path) + " cannot be read: it is a folder.");
+  }
+  std::ostringstream content;
+  content << file.rdbuf();
   LMRErrorRef error;
-  auto dictionary = dictionaryWithXMLDescription_error(content, &error);
+  auto dictionary = dictionaryWithXMLDescription_error(content.str(), &error);
   if (!dictionary) {
     throw Failure(exitBadData, inQuotes(path) + " is no property list with a dictionary: " +
                                    printable(error->localizedDescription()) + ".");

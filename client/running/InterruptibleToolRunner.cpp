@@ -6,7 +6,7 @@
 #include <csignal>
 #include <filesystem>
 #include <fstream>
-#include <iterator>
+#include <string>
 #include <thread>
 
 #include <unistd.h>
@@ -18,7 +18,9 @@ namespace {
 // The third field of /proc/PID/stat is the parent; the second, a name in brackets, may hold anything.
 bool isChild(const std::filesystem::path& process) {
   std::ifstream file(process / "stat");
-  const std::string content((std::istreambuf_iterator<char>(file)), {});
+  // Not through the buffer's own iterators, which throw when the process ends meanwhile.
+  std::string content;
+  std::getline(file, content, '\0');
   const auto name = content.rfind(')');
   const auto start = name == std::string::npos ? name : content.find_first_of("0123456789-", name);
   if (start == std::string::npos) {

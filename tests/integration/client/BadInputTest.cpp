@@ -149,6 +149,10 @@ TEST_F(BadInputTest, passwordFile_mustHoldAPassword) {
 TEST_F(BadInputTest, metadataFile_mustBeADictionary) {
   EXPECT_THAT(run({"submit", movie_, "-w", "w", "--metadata-file", movie_}),
               FailedWith(65, "is no property list with a dictionary"));
+  EXPECT_THAT(run({"submit", movie_, "-w", "w", "--metadata-file", file("empty", "")}),
+              FailedWith(65, "is no property list with a dictionary"));
+  EXPECT_THAT(run({"submit", movie_, "-w", "w", "--metadata-file", folder_.path().string()}),
+              FailedWith(66, "cannot be read: it is a folder."));
 }
 
 TEST_F(BadInputTest, fileThatCannotBeWritten_isToldBeforeTheToolIsRun) {
