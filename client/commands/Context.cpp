@@ -44,7 +44,7 @@ std::shared_ptr<LMRSession> Context::loggedInSession() const {
 std::shared_ptr<LMRSession> Context::passwordSession() const {
   if (line_.has("--kerberos")) {
     throw Failure(exitUsage, "The command \"" + std::string(line_.command()->words) +
-                                 "\" needs a login by password: leave out \"--kerberos\".");
+                                 R"(" needs a login by password: leave out "--kerberos".)");
   }
   return session();
 }

@@ -225,7 +225,7 @@ std::vector<Command> workflowCommands() {
        Needs::Login,
        createRecording,
        recordingText,
-       "Each source of the workflow gets a submission, for \"submit --submission\" and \"camera stop --submission\"."},
+       R"(Each source of the workflow gets a submission, for "submit --submission" and "camera stop --submission".)"},
   };
 }
 

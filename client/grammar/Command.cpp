@@ -128,12 +128,12 @@ std::string synopsis(const Command& command) {
 }
 
 std::string spelling(const Option& option) {
-  const std::string name(option.name);
+  std::string name(option.name);
   return option.value.empty() ? name : name + " " + std::string(option.value);
 }
 
 std::string spelling(const Operand& operand) {
-  const std::string name(operand.name);
+  std::string name(operand.name);
   switch (operand.count) {
   case Operand::Count::Optional:
     return "[" + name + "]";

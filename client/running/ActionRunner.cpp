@@ -66,7 +66,7 @@ Failure failureOf(const LMRError& error) {
   return {statusOf(error), sentence};
 }
 
-ActionRunner::ActionRunner(const CommandLine& line) : progress_(Progress::None) {
+ActionRunner::ActionRunner(const CommandLine& line) {
   if (!line.has("--quiet")) {
     const Progress withoutTerminal = line.has("--progress") ? Progress::Lines : Progress::None;
     progress_ = isatty(STDERR_FILENO) != 0 ? Progress::Terminal : withoutTerminal;

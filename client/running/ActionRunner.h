@@ -24,7 +24,7 @@ private:
   void show(const std::string& progress) const;
   void clear() const;
 
-  Progress progress_;
+  Progress progress_ = Progress::None;
   std::shared_ptr<InterruptibleToolRunner> tools_;
 };
 
