@@ -17,12 +17,14 @@
 #include <LumoraKit/login/LMRAuthenticationAction.h>
 #include <LumoraKit/login/LMRFrameworkStub.h>
 #include <LumoraKit/login/LMRFrameworkUserDefaults.h>
+#include <LumoraKit/login/LMRKeychainAccess.h>
 #include <LumoraKit/login/LMRLocalizedString.h>
 #include <LumoraKit/login/LMRPreferenceKeys.h>
 #include <LumoraKit/platform/Application.h>
 #include <LumoraKit/platform/Assert.h>
 #include <LumoraKit/platform/Authorization.h>
 #include <LumoraKit/platform/Clock.h>
+#include <LumoraKit/platform/CredentialStore.h>
 #include <LumoraKit/platform/Export.h>
 #include <LumoraKit/platform/Files.h>
 #include <LumoraKit/platform/KTAction.h>

@@ -14,6 +14,7 @@ namespace {
 Platform makeMachinePlatform() {
   Platform platform;
   platform.application = backend::makeApplication();
+  platform.credentialStore = backend::makeCredentialStore();
   platform.files = backend::makeFiles();
   platform.helperAgent = backend::makeHelperAgent();
   platform.log = backend::makeSystemLog();
@@ -28,9 +29,9 @@ Platform makeMachinePlatform() {
 }
 
 bool isComplete(const Platform& platform) {
-  return platform.application && platform.files && platform.helperAgent && platform.log && platform.mainThread &&
-         platform.mediaCapture && platform.notificationCenter && platform.preferences && platform.queues &&
-         platform.toolRunner && platform.wallClock;
+  return platform.application && platform.credentialStore && platform.files && platform.helperAgent && platform.log &&
+         platform.mainThread && platform.mediaCapture && platform.notificationCenter && platform.preferences &&
+         platform.queues && platform.toolRunner && platform.wallClock;
 }
 
 // Every platform that was ever installed stays: references to it are handed out without a count, and a detached

@@ -7,6 +7,7 @@
 namespace lumora {
 
 class Application;
+class CredentialStore;
 class Files;
 class HelperAgent;
 class Log;
@@ -28,6 +29,7 @@ class WallClock;
 ///     lumora::Platform::install(platform);
 struct LUMORA_EXPORT Platform {
   std::shared_ptr<Application> application;
+  std::shared_ptr<CredentialStore> credentialStore;
   std::shared_ptr<Files> files;
   std::shared_ptr<HelperAgent> helperAgent;
   std::shared_ptr<Log> log;

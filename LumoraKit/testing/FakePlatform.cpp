@@ -13,6 +13,7 @@ FakePlatform::~FakePlatform() {
 void FakePlatform::install() const {
   Platform platform = previous_;
   platform.application = application;
+  platform.credentialStore = credentialStore;
   platform.files = files;
   platform.helperAgent = helperAgent;
   platform.log = log;

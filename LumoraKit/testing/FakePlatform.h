@@ -3,6 +3,7 @@
 #include <LumoraKit/platform/NotificationCenter.h>
 #include <LumoraKit/platform/Platform.h>
 #include <LumoraKit/testing/FakeApplication.h>
+#include <LumoraKit/testing/FakeCredentialStore.h>
 #include <LumoraKit/testing/FakeFiles.h>
 #include <LumoraKit/testing/FakeHelperAgent.h>
 #include <LumoraKit/testing/FakeMediaCapture.h>
@@ -31,6 +32,7 @@ struct LUMORA_EXPORT FakePlatform {
   void install() const;
 
   std::shared_ptr<FakeApplication> application = std::make_shared<FakeApplication>();
+  std::shared_ptr<FakeCredentialStore> credentialStore = std::make_shared<FakeCredentialStore>();
   std::shared_ptr<FakeFiles> files = std::make_shared<FakeFiles>();
   std::shared_ptr<FakeHelperAgent> helperAgent = std::make_shared<FakeHelperAgent>();
   std::shared_ptr<RecordingLog> log = std::make_shared<RecordingLog>();

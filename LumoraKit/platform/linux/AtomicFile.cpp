@@ -1,6 +1,7 @@
 #include <LumoraKit/platform/linux/AtomicFile.h>
 #include <LumoraKit/platform/linux/FileDescriptor.h>
 
+#include <array>
 #include <cerrno>
 #include <cstdio>
 #include <cstdlib>
@@ -84,6 +85,24 @@ LMRErrorRef replaceFile(const std::filesystem::path& path, std::string_view cont
   }
   flushDirectory(folder);
   return nullptr;
+}
+
+std::optional<std::string> contentOfFile(const std::filesystem::path& path) {
+  const FileDescriptor file(open(path.c_str(), O_RDONLY | O_CLOEXEC));
+  std::string content;
+  std::array<char, std::size_t{16} * 1024> buffer{};
+  while (file.isOpen()) {
+    const ssize_t count = read(file.get(), buffer.data(), buffer.size());
+    if (count == 0) {
+      return content;
+    }
+    if (count > 0) {
+      content.append(buffer.data(), static_cast<std::size_t>(count));
+    } else if (errno != EINTR) {
+      break;
+    }
+  }
+  return std::nullopt;
 }
 
 LMRErrorRef makeDirectories(const std::filesystem::path& path, mode_t permissions) {

@@ -3,6 +3,8 @@
 #include <LumoraKit/platform/LMRError.h>
 
 #include <filesystem>
+#include <optional>
+#include <string>
 #include <string_view>
 
 #include <sys/types.h>
@@ -13,6 +15,9 @@ namespace lumora::backend {
 /// folder, flushed to the disk, moved into place. At any moment the path holds the old content or the new one, also
 /// after a crash of the machine. Null on success; after a failure nothing has changed.
 LUMORA_INTERNAL LMRErrorRef replaceFile(const std::filesystem::path& path, std::string_view content);
+
+/// The whole content of a file; nothing, with errno set, when it cannot be read.
+LUMORA_INTERNAL std::optional<std::string> contentOfFile(const std::filesystem::path& path);
 
 /// Makes a folder with its missing parents, with these permissions less the umask. Null on success, also when it is
 /// there already.

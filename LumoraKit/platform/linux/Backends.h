@@ -10,6 +10,7 @@
 namespace lumora {
 
 class Application;
+class CredentialStore;
 class Files;
 class HelperAgent;
 class Log;
@@ -24,6 +25,8 @@ namespace backend {
 
 /// Identity from the running program, language from the locale.
 std::shared_ptr<Application> makeApplication();
+/// The desktop's Secret Service.
+LUMORA_INTERNAL std::shared_ptr<CredentialStore> makeCredentialStore();
 /// POSIX files and XDG folders.
 std::shared_ptr<Files> makeFiles();
 /// The machine's D-Bus services.

@@ -3,7 +3,10 @@
 #include <LumoraKit/platform/linux/GLibPtr.h>
 
 #include <chrono>
+#include <functional>
+#include <memory>
 #include <string>
+#include <vector>
 
 namespace lumora::backend {
 
@@ -21,6 +24,14 @@ public:
 private:
   GLibPtr<GMainContext> context_;
   GLibPtr<GDBusConnection> connection_;
+};
+
+/// A method of an object that a service has.
+struct DBusMethod {
+  std::string service;
+  std::string path;
+  std::string interface;
+  std::string name;
 };
 
 /// What one operation on a bus needs to wait for its answers: connecting and calling share one deadline, after which
@@ -41,11 +52,25 @@ public:
   /// \param parameters taken over when floating
   GLibPtr<GVariant> call(const DBusLink& link, const std::string& service, const char* method, GVariant* parameters,
                          GDBusCallFlags flags, GLibPtr<GError>& error);
+  /// Calls any method.
+  GLibPtr<GVariant> call(const DBusLink& link, const DBusMethod& method, GVariant* parameters, GDBusCallFlags flags,
+                         GLibPtr<GError>& error);
+
+  /// Calls methods that take the same parameters, without waiting for one answer before the next call. Null in place of
+  /// an answer that did not come.
+  std::vector<GLibPtr<GVariant>> callEach(const DBusLink& link, const std::vector<DBusMethod>& methods,
+                                          GVariant* parameters);
+
+  /// Starts something that takes a cancellable and tells its result to a callback, and waits for the result.
+  using Beginning = std::function<void(GCancellable* cancellable, GAsyncReadyCallback told, gpointer data)>;
+  GLibPtr<GAsyncResult> result(const Beginning& begin);
+
+  /// Waits for what signals will tell; false when that took longer than the limit. This time does not count.
+  bool waitUntil(const std::function<bool()>& condition, std::chrono::milliseconds limit);
 
 private:
   static void keepResult(GObject* source, GAsyncResult* result, gpointer operation);
   static gboolean cancel(gpointer cancellable);
-  GLibPtr<GAsyncResult> wait();
 
   GLibPtr<GMainContext> context_;
   GLibPtr<GCancellable> cancellable_;

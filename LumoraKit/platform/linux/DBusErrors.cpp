@@ -9,14 +9,6 @@ namespace {
 
 HelperAgentError meaningOfBusError(int code) {
   switch (code) {
-  case G_DBUS_ERROR_SERVICE_UNKNOWN:
-  case G_DBUS_ERROR_NAME_HAS_NO_OWNER:
-  case G_DBUS_ERROR_SPAWN_EXEC_FAILED:
-  case G_DBUS_ERROR_SPAWN_FORK_FAILED:
-  case G_DBUS_ERROR_SPAWN_CHILD_EXITED:
-  case G_DBUS_ERROR_SPAWN_CHILD_SIGNALED:
-  case G_DBUS_ERROR_SPAWN_FAILED:
-  case G_DBUS_ERROR_SPAWN_SERVICE_NOT_FOUND:
   case G_DBUS_ERROR_UNKNOWN_OBJECT:
   case G_DBUS_ERROR_UNKNOWN_INTERFACE:
   case G_DBUS_ERROR_UNKNOWN_METHOD:
@@ -30,7 +22,7 @@ HelperAgentError meaningOfBusError(int code) {
   case G_DBUS_ERROR_TIMED_OUT:
     return HelperAgentError::TimedOut;
   default:
-    return HelperAgentError::Refused;
+    return meansNoService(code) ? HelperAgentError::NoAgent : HelperAgentError::Refused;
   }
 }
 
@@ -65,6 +57,22 @@ const char* sentenceFor(HelperAgentError code) {
 }
 
 } // namespace
+
+bool meansNoService(int code) {
+  switch (code) {
+  case G_DBUS_ERROR_SERVICE_UNKNOWN:
+  case G_DBUS_ERROR_NAME_HAS_NO_OWNER:
+  case G_DBUS_ERROR_SPAWN_EXEC_FAILED:
+  case G_DBUS_ERROR_SPAWN_FORK_FAILED:
+  case G_DBUS_ERROR_SPAWN_CHILD_EXITED:
+  case G_DBUS_ERROR_SPAWN_CHILD_SIGNALED:
+  case G_DBUS_ERROR_SPAWN_FAILED:
+  case G_DBUS_ERROR_SPAWN_SERVICE_NOT_FOUND:
+    return true;
+  default:
+    return false;
+  }
+}
 
 LMRErrorRef helperAgentError(HelperAgentError code, std::string text) {
   return LMRError::make(HelperAgentErrorDomain, static_cast<std::int64_t>(code), std::move(text));

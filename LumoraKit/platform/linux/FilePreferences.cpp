@@ -3,24 +3,19 @@
 #include <LumoraKit/platform/PropertyList.h>
 #include <LumoraKit/platform/linux/AtomicFile.h>
 #include <LumoraKit/platform/linux/Backends.h>
-#include <LumoraKit/platform/linux/FileDescriptor.h>
+#include <LumoraKit/platform/linux/FileLock.h>
 #include <LumoraKit/platform/linux/FilePreferences.h>
 #include <LumoraKit/platform/linux/UserFolders.h>
 
-#include <array>
 #include <cerrno>
 #include <cstdio>
 
-#include <fcntl.h>
-#include <sys/file.h>
 #include <sys/stat.h>
-#include <unistd.h>
 
 namespace lumora::backend {
 namespace {
 
 constexpr mode_t folderPermissions = 0700;
-constexpr mode_t lockPermissions = 0600;
 constexpr unsigned char firstPrintable = 0x20;
 
 // A file name for any domain, each its own: what would lead out of the folder is written as %XX.
@@ -38,40 +33,6 @@ std::string fileName(std::string_view domain) {
   return name;
 }
 
-// The whole content; nothing, with errno set, when it cannot be read.
-std::optional<std::string> contentOf(const std::filesystem::path& path) {
-  const FileDescriptor file(open(path.c_str(), O_RDONLY | O_CLOEXEC));
-  std::string content;
-  std::array<char, std::size_t{16} * 1024> buffer{};
-  while (file.isOpen()) {
-    const ssize_t count = read(file.get(), buffer.data(), buffer.size());
-    if (count == 0) {
-      return content;
-    }
-    if (count > 0) {
-      content.append(buffer.data(), static_cast<std::size_t>(count));
-    } else if (errno != EINTR) {
-      break;
-    }
-  }
-  return std::nullopt;
-}
-
-// Waits its turn among all threads and processes. The lock is on a file of its own: the preferences file is another
-// one after each change.
-LMRErrorRef lockFile(const std::filesystem::path& path, FileDescriptor& lock) {
-  lock = FileDescriptor(open(path.c_str(), O_RDWR | O_CREAT | O_CLOEXEC | O_NOFOLLOW, lockPermissions));
-  if (!lock.isOpen()) {
-    return LMRError::fromErrno(errno, path.string());
-  }
-  while (flock(lock.get(), LOCK_EX) != 0) {
-    if (errno != EINTR) {
-      return LMRError::fromErrno(errno, path.string());
-    }
-  }
-  return nullptr;
-}
-
 LMRErrorRef setAside(const std::filesystem::path& path, const LMRErrorRef& damage) {
   auto aside = path;
   aside += ".damaged-" + makeUUIDString();
@@ -84,7 +45,7 @@ LMRErrorRef setAside(const std::filesystem::path& path, const LMRErrorRef& damag
 
 // Reads what is stored, under the lock. A missing file is an empty one.
 LMRErrorRef load(const std::filesystem::path& path, Dictionary& stored) {
-  const auto content = contentOf(path);
+  const auto content = contentOfFile(path);
   if (!content) {
     return errno == ENOENT ? nullptr : LMRError::fromErrno(errno, path.string());
   }
@@ -120,9 +81,10 @@ LMRErrorRef update(const std::filesystem::path& folder, std::string_view domain,
   }
   const auto name = fileName(domain);
   const auto path = folder / (name + ".plist");
-  FileDescriptor lock;
+  // On a file of its own: the preferences file is another one after each change.
+  FileLock lock;
   Dictionary stored;
-  LMRErrorRef error = lockFile(folder / ("." + name + ".lock"), lock);
+  LMRErrorRef error = lock.take(folder / ("." + name + ".lock"));
   if (!error) {
     error = load(path, stored);
   }
@@ -137,7 +99,7 @@ LMRErrorRef update(const std::filesystem::path& folder, std::string_view domain,
 
 std::optional<Value> FilePreferences::value(std::string_view domain, std::string_view key) {
   // Without the lock: a file is only ever replaced as a whole.
-  const auto content = folder_.empty() ? std::nullopt : contentOf(folder_ / (fileName(domain) + ".plist"));
+  const auto content = folder_.empty() ? std::nullopt : contentOfFile(folder_ / (fileName(domain) + ".plist"));
   const auto stored = content ? dictionaryWithXMLDescription(*content) : std::nullopt;
   const Value* const found = stored ? stored->find(key) : nullptr;
   return found ? std::optional(*found) : std::nullopt;

@@ -49,4 +49,9 @@ std::filesystem::path userDataFolder() {
   return userFolder("XDG_DATA_HOME", ".local/share");
 }
 
+std::filesystem::path userRuntimeFolder() {
+  auto folder = absoluteFromEnvironment("XDG_RUNTIME_DIR");
+  return folder.empty() ? userFolder("XDG_CACHE_HOME", ".cache") : folder;
+}
+
 } // namespace lumora::backend

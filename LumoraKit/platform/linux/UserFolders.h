@@ -14,4 +14,7 @@ LUMORA_INTERNAL std::filesystem::path userConfigurationFolder();
 /// $XDG_DATA_HOME, else ~/.local/share.
 LUMORA_INTERNAL std::filesystem::path userDataFolder();
 
+/// $XDG_RUNTIME_DIR, else $XDG_CACHE_HOME, else ~/.cache.
+LUMORA_INTERNAL std::filesystem::path userRuntimeFolder();
+
 } // namespace lumora::backend
