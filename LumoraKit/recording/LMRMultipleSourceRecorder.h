@@ -29,7 +29,10 @@
 ///
 /// It is driven as any recorder is, and is itself the delegate of its sources: its outcome is told when all of them
 /// have reported theirs, and the first failure of a source is the failure of the whole. After a failure the sources
-/// are no longer listened to, and nothing more is told of them.
+/// are no longer listened to, and nothing more is told of them. A stop is told at least once, and again by each source
+/// that reports when all have stopped already. Make a request when the last one's outcome was told and, in a program
+/// that is faster than a user, not inside that message: a source whose report is still on its way is counted when it
+/// comes.
 ///
 /// With a mix of remote and local sources, the remote ones are started, paused and resumed first, one after another on
 /// the caller's thread, which is blocked meanwhile; the local ones follow on the main thread once every remote one has
