@@ -11,4 +11,16 @@ MovieFileOutput::~MovieFileOutput() = default;
 CaptureSession::~CaptureSession() = default;
 MediaCapture::~MediaCapture() = default;
 
+void MovieFileOutput::recordToOutputFileURL_atHostTime(const std::filesystem::path& file, HostTime) {
+  recordToOutputFileURL(file);
+}
+
+void MovieFileOutput::pauseRecordingAtHostTime(HostTime) {
+  pauseRecording();
+}
+
+void MovieFileOutput::resumeRecordingAtHostTime(HostTime) {
+  resumeRecording();
+}
+
 } // namespace lumora

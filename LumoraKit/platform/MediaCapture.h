@@ -158,6 +158,13 @@ public:
   virtual void recordToOutputFileURL(const std::optional<std::filesystem::path>& file) = 0;
   virtual void pauseRecording() = 0;
   virtual void resumeRecording() = 0;
+  /// The same three for a moment of the host clock that has just been, for use inside the message of the first sample
+  /// after it: the file begins, is paused and goes on at the moment, not at the sample. Outputs that are asked for the
+  /// same moments so keep the same time, however their devices' samples lie. Without a definition of its own an output
+  /// takes them for the plain requests.
+  virtual void recordToOutputFileURL_atHostTime(const std::filesystem::path& file, HostTime time);
+  virtual void pauseRecordingAtHostTime(HostTime time);
+  virtual void resumeRecordingAtHostTime(HostTime time);
   /// The file being written; nothing when none is.
   virtual std::optional<std::filesystem::path> outputFileURL() const = 0;
 };

@@ -8,10 +8,8 @@
 
 namespace {
 
-void beginFile(const LMRLocalAudioRecorder& recorder) {
-  const auto file = recorder.outputFileURL();
-  lumora::log("Recording new podcast episode at %@", {file ? lumora::text(*file) : "(null)"});
-  recorder.movieFileOutput()->recordToOutputFileURL(file);
+lumora::HostTime hostTime() {
+  return lumora::Platform::current().mediaCapture->hostTime();
 }
 
 } // namespace
@@ -40,15 +38,21 @@ void LMRLocalAudioRecorder::startWithDelay(double) {
   const auto callersQueue = queues->currentQueue();
   const auto self = std::static_pointer_cast<LMRLocalAudioRecorder>(shared_from_this());
   queues->runAfter(std::chrono::nanoseconds::zero(), callersQueue ? callersQueue : queues->concurrentQueue(),
-                   [self] { beginFile(*self); });
+                   [self] { self->beginFileNow(); });
+}
+
+void LMRLocalAudioRecorder::beginFileNow() {
+  const auto file = outputFileURL();
+  lumora::log("Recording new podcast episode at %@", {file ? lumora::text(*file) : "(null)"});
+  beginFile(hostTime());
 }
 
 void LMRLocalAudioRecorder::pause() {
-  movieFileOutput()->pauseRecording();
+  pauseFile(hostTime());
 }
 
 void LMRLocalAudioRecorder::resume() {
-  movieFileOutput()->resumeRecording();
+  resumeFile(hostTime());
 }
 
 bool LMRLocalAudioRecorder::decodeWithCoder(const lumora::KeyedUnarchiver& coder) {

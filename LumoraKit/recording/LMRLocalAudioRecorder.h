@@ -35,4 +35,7 @@ public:
 
 protected:
   bool decodeWithCoder(const lumora::KeyedUnarchiver& coder) override;
+
+private:
+  void beginFileNow();
 };

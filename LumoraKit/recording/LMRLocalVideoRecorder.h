@@ -20,7 +20,8 @@
 ///     recorder->start();
 ///
 /// Start, pause and resume are not performed when they are requested: a request notes the host time, and the first
-/// captured sample that has reached it starts, pauses or resumes the file, so that each falls on a sample.
+/// captured sample that has reached it starts, pauses or resumes the file, so that each falls on a sample. In the file
+/// time counts from the request, not from the sample: recorders that are asked together stay together.
 ///
 /// The application keeps the session running; the recorder stops it when it dies, which may happen on any thread.
 class LUMORA_EXPORT LMRLocalVideoRecorder : public LMRSourceRecorder,
@@ -66,6 +67,10 @@ public:
   /// When the output reported that the recording started, and that it finished.
   std::optional<lumora::WallTime> recordingStartDate() const { return recordingStartDate_.get(); }
   std::optional<lumora::WallTime> recordingStopDate() const { return recordingStopDate_.get(); }
+
+  /// The moments at which the file began, was paused, went on, was paused and so on: its time is the host's from the
+  /// first one on, without the pauses. Recorders whose moments agree are in step.
+  std::vector<lumora::HostTime> hostTimesOfFile() const { return hostTimesOfFile_.get(); }
 
   /// What writes the file; this recorder is its delegate.
   std::shared_ptr<lumora::MovieFileOutput> movieFileOutput() const { return movieFileOutput_.get(); }
@@ -144,6 +149,11 @@ protected:
   /// output stays. False, with a log line when there is an error, when there is no such session.
   bool rebuildSession(const lumora::KeyedUnarchiver& coder, SessionOfAudioDevice makeSession);
 
+  /// Asks the output to begin, pause or go on with the file at that moment.
+  void beginFile(lumora::HostTime time);
+  void pauseFile(lumora::HostTime time);
+  void resumeFile(lumora::HostTime time);
+
 private:
   // A host time that waits for its sample. The largest one stands for "none"; it is 584 years away.
   class PendingHostTime {
@@ -151,18 +161,19 @@ private:
     bool isSet() const { return time_.load(std::memory_order_relaxed) != none; }
     std::optional<lumora::HostTime> get() const;
     void set(lumora::HostTime time) { time_ = time; }
-    // Clears it when the sample has passed it; or has reached it.
-    bool takeBefore(lumora::HostTime sample);
-    bool takeUpTo(lumora::HostTime sample);
+    // Takes it away when the sample has passed it; or has reached it. Nothing otherwise.
+    std::optional<lumora::HostTime> takeBefore(lumora::HostTime sample);
+    std::optional<lumora::HostTime> takeUpTo(lumora::HostTime sample);
 
   private:
-    bool take(lumora::HostTime time);
+    std::optional<lumora::HostTime> take(lumora::HostTime time);
     static constexpr auto none = std::numeric_limits<lumora::HostTime>::max();
     std::atomic<lumora::HostTime> time_ = none;
   };
 
   bool takeDecodedSession(const std::shared_ptr<lumora::CaptureSession>& session, const LMRErrorRef& error);
   void setCompressionOptionsOfConnections() const;
+  void noteHostTime(lumora::HostTime time, bool hasEffect);
   bool finishFile() const;
   void actOnSample(const lumora::SampleBuffer& sampleBuffer);
   void reportFinish(const std::filesystem::path& file, const LMRErrorRef& error);
@@ -180,6 +191,7 @@ private:
   lumora::Property<std::optional<std::filesystem::path>> outputFileURL_;
   lumora::Property<std::optional<lumora::WallTime>> recordingStartDate_;
   lumora::Property<std::optional<lumora::WallTime>> recordingStopDate_;
+  lumora::Property<std::vector<lumora::HostTime>> hostTimesOfFile_;
   lumora::Property<std::shared_ptr<lumora::MovieFileOutput>> movieFileOutput_;
   lumora::Property<std::optional<std::string>> submissionUUID_;
   std::atomic<bool> deleteMovieFileWhenItFinishesRecording_ = false;

@@ -8,6 +8,10 @@
 
 namespace {
 
+// A file does not begin earlier before its first sample: that of a recorder which was started long before its session
+// would begin with nothing.
+constexpr lumora::HostTime longestLead = 200'000'000;
+
 lumora::WallTime now() {
   return lumora::Platform::current().wallClock->now();
 }
@@ -24,19 +28,20 @@ std::optional<lumora::HostTime> LMRLocalVideoRecorder::PendingHostTime::get() co
   return time == none ? std::nullopt : std::optional(time);
 }
 
-bool LMRLocalVideoRecorder::PendingHostTime::takeBefore(lumora::HostTime sample) {
-  auto time = time_.load();
-  return time != none && time < sample && take(time);
+std::optional<lumora::HostTime> LMRLocalVideoRecorder::PendingHostTime::takeBefore(lumora::HostTime sample) {
+  const auto time = time_.load();
+  return time != none && time < sample ? take(time) : std::nullopt;
 }
 
-bool LMRLocalVideoRecorder::PendingHostTime::takeUpTo(lumora::HostTime sample) {
-  auto time = time_.load();
-  return time != none && time <= sample && take(time);
+std::optional<lumora::HostTime> LMRLocalVideoRecorder::PendingHostTime::takeUpTo(lumora::HostTime sample) {
+  const auto time = time_.load();
+  return time != none && time <= sample ? take(time) : std::nullopt;
 }
 
 // Only the request that was looked at: one that was made meanwhile waits for its own sample.
-bool LMRLocalVideoRecorder::PendingHostTime::take(lumora::HostTime time) {
-  return time_.compare_exchange_strong(time, none);
+std::optional<lumora::HostTime> LMRLocalVideoRecorder::PendingHostTime::take(lumora::HostTime time) {
+  auto expected = time;
+  return time_.compare_exchange_strong(expected, none) ? std::optional(time) : std::nullopt;
 }
 
 // Runs for every sample: with nothing pending it must stay a matter of three loads.
@@ -55,15 +60,45 @@ void LMRLocalVideoRecorder::actOnSample(const lumora::SampleBuffer& sampleBuffer
     return;
   }
   const std::lock_guard lock(actionMutex_);
-  if (hostTimeToStart_.takeBefore(*sampleTime)) {
+  if (const auto start = hostTimeToStart_.takeBefore(*sampleTime)) {
     const auto file = outputFileURL();
     lumora::log("Recording new test podcast episode (by calling -recordToOutputFileURL:) at %@",
                 {file ? lumora::text(*file) : "(null)"});
-    movieFileOutput()->recordToOutputFileURL(file);
-  } else if (hostTimeToPause_.takeUpTo(*sampleTime)) {
-    movieFileOutput()->pauseRecording();
-  } else if (hostTimeToResume_.takeUpTo(*sampleTime)) {
-    movieFileOutput()->resumeRecording();
+    beginFile(std::max(*start, *sampleTime - std::min(*sampleTime, longestLead)));
+  } else if (const auto pause = hostTimeToPause_.takeUpTo(*sampleTime)) {
+    pauseFile(*pause);
+  } else if (const auto resume = hostTimeToResume_.takeUpTo(*sampleTime)) {
+    resumeFile(*resume);
+  }
+}
+
+void LMRLocalVideoRecorder::beginFile(lumora::HostTime time) {
+  const auto file = outputFileURL();
+  if (!file) {
+    movieFileOutput()->recordToOutputFileURL(std::nullopt);
+    return;
+  }
+  noteHostTime(time, hostTimesOfFile().empty());
+  movieFileOutput()->recordToOutputFileURL_atHostTime(*file, time);
+}
+
+void LMRLocalVideoRecorder::pauseFile(lumora::HostTime time) {
+  noteHostTime(time, hostTimesOfFile().size() % 2 == 1);
+  movieFileOutput()->pauseRecordingAtHostTime(time);
+}
+
+void LMRLocalVideoRecorder::resumeFile(lumora::HostTime time) {
+  const auto count = hostTimesOfFile().size();
+  noteHostTime(time, count != 0 && count % 2 == 0);
+  movieFileOutput()->resumeRecordingAtHostTime(time);
+}
+
+// A request that changes nothing (a second pause, a second start) leaves no mark.
+void LMRLocalVideoRecorder::noteHostTime(lumora::HostTime time, bool hasEffect) {
+  if (hasEffect) {
+    auto times = hostTimesOfFile();
+    times.push_back(time);
+    hostTimesOfFile_.set(std::move(times));
   }
 }
 

@@ -74,6 +74,26 @@ void FakeMovieFileOutput::resumeRecording() {
   }
 }
 
+void FakeMovieFileOutput::recordToOutputFileURL_atHostTime(const std::filesystem::path& file, HostTime time) {
+  note(time);
+  recordToOutputFileURL(file);
+}
+
+void FakeMovieFileOutput::pauseRecordingAtHostTime(HostTime time) {
+  note(time);
+  pauseRecording();
+}
+
+void FakeMovieFileOutput::resumeRecordingAtHostTime(HostTime time) {
+  note(time);
+  resumeRecording();
+}
+
+void FakeMovieFileOutput::note(HostTime time) {
+  const std::lock_guard lock(mutex_);
+  requestedHostTimes_.push_back(time);
+}
+
 std::optional<std::filesystem::path> FakeMovieFileOutput::outputFileURL() const {
   const std::lock_guard lock(mutex_);
   return outputFileURL_;
@@ -209,6 +229,11 @@ void FakeMovieFileOutput::forget(const std::filesystem::path& file) {
 std::vector<std::string> FakeMovieFileOutput::requests() const {
   const std::lock_guard lock(mutex_);
   return requests_;
+}
+
+std::vector<HostTime> FakeMovieFileOutput::requestedHostTimes() const {
+  const std::lock_guard lock(mutex_);
+  return requestedHostTimes_;
 }
 
 std::optional<CompressionOptions> FakeMovieFileOutput::compressionOptions(const CaptureConnection& connection) const {

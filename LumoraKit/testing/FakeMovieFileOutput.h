@@ -51,6 +51,9 @@ public:
   void recordToOutputFileURL(const std::optional<std::filesystem::path>& file) override;
   void pauseRecording() override;
   void resumeRecording() override;
+  void recordToOutputFileURL_atHostTime(const std::filesystem::path& file, HostTime time) override;
+  void pauseRecordingAtHostTime(HostTime time) override;
+  void resumeRecordingAtHostTime(HostTime time) override;
   std::optional<std::filesystem::path> outputFileURL() const override;
 
   /// Shows a sample to the delegate, on the calling thread. False when nothing was shown: the session is not running,
@@ -73,6 +76,8 @@ public:
 
   /// The requests in their order: "record <file>", "finish", "pause", "resume"; also those that had no effect.
   std::vector<std::string> requests() const;
+  /// The moments of those requests that named one.
+  std::vector<HostTime> requestedHostTimes() const;
   std::optional<CompressionOptions> compressionOptions(const CaptureConnection& connection) const;
 
   /// For the session. False when the output is in one already. An output that leaves its session finishes its file.
@@ -88,6 +93,7 @@ private:
     LMRErrorRef error;
   };
 
+  void note(HostTime time);
   void finish(LMRErrorRef error);
   void report(Outcome outcome);
   LMRErrorRef makeFile(const std::filesystem::path& file);
@@ -99,6 +105,7 @@ private:
   std::weak_ptr<FakeCaptureSession> session_;
   std::map<const CaptureConnection*, CompressionOptions> compressionOptions_;
   std::vector<std::string> requests_;
+  std::vector<HostTime> requestedHostTimes_;
   std::deque<Outcome> outcomes_;
   State state_ = State::Idle;
   std::optional<std::filesystem::path> outputFileURL_;

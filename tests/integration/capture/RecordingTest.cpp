@@ -169,6 +169,40 @@ TEST_F(Recording, goesOnWithItsFile_whenAskedForItAgainWhileItIsWrittenOrFinishe
   EXPECT_EQ(output_->outputFileURL(), std::nullopt);
 }
 
+TEST_F(Recording, countsFromTheMoments_whenRequestsNameOnesBetweenPictures) {
+  addCameraAndMicrophone();
+  run();
+  // Each is 20 ms before the picture that it comes with.
+  const auto moment = [&] { return delegate_->pictures().back() - 20'000'000; };
+  HostTime start = 0;
+  HostTime pause = 0;
+  HostTime resume = 0;
+  delegate_->atNext(MediaType::Video, [&](MovieFileOutput& output) {
+    start = moment();
+    output.recordToOutputFileURL_atHostTime(file("a.mov"), start);
+  });
+  std::this_thread::sleep_for(500ms);
+  delegate_->atNext(MediaType::Video, [&](MovieFileOutput& output) {
+    pause = moment();
+    output.pauseRecordingAtHostTime(pause);
+  });
+  std::this_thread::sleep_for(200ms);
+  delegate_->atNext(MediaType::Video, [&](MovieFileOutput& output) {
+    resume = moment();
+    output.resumeRecordingAtHostTime(resume);
+  });
+  std::this_thread::sleep_for(500ms);
+  const HostTime stop = stopAtNextPicture();
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  std::vector<double> expected = shown(start, pause, 0);
+  const std::vector<double> second = shown(resume, stop, seconds(pause - start));
+  expected.insert(expected.end(), second.begin(), second.end());
+  // Nothing is shown before the first picture, which therefore is shown from the beginning on.
+  ASSERT_FALSE(expected.empty());
+  expected.front() = 0;
+  expectTimes(Movie(file("a.mov")).times("v"), expected);
+}
+
 TEST_F(Recording, finishesWithAnError_whenStoppedBeforeTheFirstSample) {
   addCameraAndMicrophone();
   ASSERT_EQ(session_->addOutput(output_), nullptr);

@@ -45,6 +45,19 @@ TEST_F(Sample, doesNotStart_whenItsHostTimeEqualsTheRequest_butPausesAndResumes)
   EXPECT_THAT(output().requests(), ElementsAre(recordRequest(), "pause", "resume"));
 }
 
+TEST_F(Sample, handsTheMomentOfTheRequestOn_whenItComesLater) {
+  recorder_->start();
+  sample(1020);
+  capture().setHostTime(1500);
+  recorder_->pause();
+  sample(1530);
+  capture().setHostTime(1600);
+  recorder_->resume();
+  sample(1605);
+  EXPECT_THAT(output().requests(), ElementsAre(recordRequest(), "pause", "resume"));
+  EXPECT_THAT(output().requestedHostTimes(), ElementsAre(1000, 1500, 1600));
+}
+
 TEST_F(Sample, startsFirstAndPausesLater_whenBothArePending) {
   recorder_->start();
   recorder_->pause();

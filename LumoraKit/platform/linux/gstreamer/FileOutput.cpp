@@ -5,7 +5,6 @@
 #include <algorithm>
 
 namespace lumora::backend {
-
 FileOutput::FileOutput(std::shared_ptr<Queues> queues, std::shared_ptr<Encoders> encoders)
     : queues_(std::move(queues)), encoders_(std::move(encoders)),
       messages_(queues_->makeSerialQueue("movie file output")) {}
@@ -49,7 +48,14 @@ void FileOutput::leave() {
 }
 
 void FileOutput::recordToOutputFileURL(const std::optional<std::filesystem::path>& file) {
-  const HostTime time = DelegateCall::requestTime();
+  record(file, DelegateCall::requestTime());
+}
+
+void FileOutput::recordToOutputFileURL_atHostTime(const std::filesystem::path& file, HostTime time) {
+  record(file, time);
+}
+
+void FileOutput::record(const std::optional<std::filesystem::path>& file, HostTime time) {
   std::shared_ptr<Recording> next;
   {
     const std::lock_guard lock(mutex_);
@@ -93,14 +99,22 @@ std::vector<TrackPlan> FileOutput::planTracks() const {
 }
 
 void FileOutput::pauseRecording() {
-  if (const auto recording = current()) {
-    recording->pause(DelegateCall::requestTime());
-  }
+  pauseRecordingAtHostTime(DelegateCall::requestTime());
 }
 
 void FileOutput::resumeRecording() {
+  resumeRecordingAtHostTime(DelegateCall::requestTime());
+}
+
+void FileOutput::pauseRecordingAtHostTime(HostTime time) {
   if (const auto recording = current()) {
-    recording->resume(DelegateCall::requestTime());
+    recording->pause(time);
+  }
+}
+
+void FileOutput::resumeRecordingAtHostTime(HostTime time) {
+  if (const auto recording = current()) {
+    recording->resume(time);
   }
 }
 

@@ -23,6 +23,9 @@ public:
   void recordToOutputFileURL(const std::optional<std::filesystem::path>& file) override;
   void pauseRecording() override;
   void resumeRecording() override;
+  void recordToOutputFileURL_atHostTime(const std::filesystem::path& file, HostTime time) override;
+  void pauseRecordingAtHostTime(HostTime time) override;
+  void resumeRecordingAtHostTime(HostTime time) override;
   std::optional<std::filesystem::path> outputFileURL() const override;
 
   /// For the session: takes the output, unless another session has it; gives it the session's connections; lets it
@@ -38,6 +41,7 @@ public:
 private:
   using Recordings = std::vector<std::shared_ptr<Recording>>;
 
+  void record(const std::optional<std::filesystem::path>& file, HostTime time);
   std::shared_ptr<Recording> begin(const std::filesystem::path& file, HostTime time);
   std::vector<TrackPlan> planTracks() const;
   std::shared_ptr<Recording> current() const;

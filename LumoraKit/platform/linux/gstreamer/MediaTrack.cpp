@@ -4,6 +4,8 @@
 #include <gst/audio/audio.h>
 #include <gst/video/video.h>
 
+#include <utility>
+
 namespace lumora::backend {
 namespace {
 
@@ -25,7 +27,8 @@ public:
     Samples result;
     if (const auto fileTime = timeline.fileTime(time)) {
       GstPtr<GstBuffer> picture(gst_buffer_copy(gst_sample_get_buffer(&sample)));
-      result.push_back(makeSample(std::move(picture), steadyCaps(sample), after(*fileTime), GST_CLOCK_TIME_NONE));
+      const std::uint64_t shownAt = std::exchange(isFirst_, false) ? 0 : after(*fileTime);
+      result.push_back(makeSample(std::move(picture), steadyCaps(sample), shownAt, GST_CLOCK_TIME_NONE));
     }
     return result;
   }
@@ -50,6 +53,9 @@ private:
   }
 
   GstVideoInfo first_{};
+  // The first picture is shown from the file's beginning on, whenever it was taken: the muxer lets each track begin
+  // there, and would move the whole track.
+  bool isFirst_ = true;
   GstPtr<GstCaps> original_;
   GstPtr<GstCaps> steady_;
   std::uint64_t next_ = 0;
