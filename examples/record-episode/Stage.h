@@ -3,17 +3,11 @@
 #include <chrono>
 #include <filesystem>
 #include <functional>
-#include <memory>
 #include <string>
-#include <vector>
-
-namespace lumora {
-class ToolRunner;
-}
 
 /// \file
-/// What the tutorial needs around it and an application already has: a place to write to, a server to talk to, and a
-/// loop that serves the main thread.
+/// What the tutorial needs around it and an application already has: a place to write to, and a loop that serves the
+/// main thread.
 
 namespace stage {
 
@@ -36,26 +30,6 @@ public:
 
 private:
   std::filesystem::path path_;
-};
-
-/// A sandbox server with one user, to which every tool run of this process goes.
-class Server {
-public:
-  Server(std::filesystem::path root, const std::string& user, const std::string& password);
-
-  /// The server's own record of what was submitted, as text.
-  std::string episodes() const;
-  /// The movie files that it stores.
-  std::vector<std::filesystem::path> storedMovies() const;
-  /// What a movie file holds, read back from the file: a line a track with codec, format and duration.
-  std::vector<std::string> mediaFacts(const std::filesystem::path& movie) const;
-
-private:
-  std::string run(const std::string& program, const std::vector<std::string>& arguments,
-                  const std::string& input = {}) const;
-
-  std::filesystem::path root_;
-  std::shared_ptr<lumora::ToolRunner> machine_;
 };
 
 /// From now on Ctrl-C ends a wait with a Failure, in place of the process.
