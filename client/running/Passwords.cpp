@@ -17,11 +17,20 @@ namespace lumora::client {
 
 namespace {
 
+[[noreturn]] void fail(const std::string& path, const std::string& reason) {
+  const std::string name = path == "-" ? "standard input" : "the file " + inQuotes(path);
+  throw Failure(exitNoInput, "No password can be read from " + name + ": " + reason + ".");
+}
+
 /// Standard input, or a file that is closed in the end.
 class Input {
 public:
   explicit Input(const std::string& path)
-      : descriptor_(path == "-" ? STDIN_FILENO : open(path.c_str(), O_RDONLY | O_CLOEXEC)) {}
+      : descriptor_(path == "-" ? STDIN_FILENO : open(path.c_str(), O_RDONLY | O_CLOEXEC)) {
+    if (descriptor_ < 0) {
+      fail(path, std::strerror(errno));
+    }
+  }
   Input(const Input&) = delete;
   Input& operator=(const Input&) = delete;
   ~Input() {
@@ -47,11 +56,6 @@ public:
 private:
   int descriptor_;
 };
-
-[[noreturn]] void fail(const std::string& path, const std::string& reason) {
-  const std::string name = path == "-" ? "standard input" : "the file " + inQuotes(path);
-  throw Failure(exitNoInput, "No password can be read from " + name + ": " + reason + ".");
-}
 
 Secret checked(Secret secret) {
   if (g_utf8_validate_len(secret.text().data(), secret.text().size(), nullptr) == FALSE) {

@@ -126,7 +126,8 @@ TEST_F(BadInputTest, fileThatIsNotThere_isToldBeforeTheToolIsRun) {
   EXPECT_THAT(run({"workflow", "install", missing}), FailedWith(66, "No such file or directory"));
   EXPECT_THAT(run({"workflow", "submit", "w", movie_, missing}), FailedWith(66, "No such file or directory"));
   EXPECT_THAT(run({"submit", movie_, "-w", "w", "--metadata-file", missing}), FailedWith(66, "No such file"));
-  EXPECT_THAT(run({"login", "--password-file", missing}), FailedWith(66, "No password can be read from the file"));
+  EXPECT_THAT(run({"login", "--password-file", missing}),
+              FailedWith(66, "No password can be read from the file \"" + missing + "\": No such file"));
   EXPECT_THAT(requests(), IsEmpty());
 }
 
