@@ -45,7 +45,7 @@ fs::path rootOf(fs::path path, const Place& place) {
 fs::path findRoot(fs::path path, const Place& place) {
   constexpr int mostLinks = 40;
   for (int links = 0; links < mostLinks; ++links) {
-    const fs::path root = rootOf(path, place);
+    fs::path root = rootOf(path, place);
     if (!root.empty() && Store::existsAt(root)) {
       return root;
     }

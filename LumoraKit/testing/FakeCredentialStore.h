@@ -78,7 +78,7 @@ private:
     std::optional<CredentialError> standing;
   };
   struct Item {
-    std::uint64_t number;
+    std::uint64_t number = 0;
     StoredCredential content;
   };
 

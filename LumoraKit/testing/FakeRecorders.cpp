@@ -40,7 +40,7 @@ void RecorderRequests::takeStart(LMRSourceRecorder& recorder, double delay) {
   take(recorder, "start " + Value(delay).description());
 }
 
-void RecorderRequests::take(LMRSourceRecorder& recorder, std::string request) {
+void RecorderRequests::take(LMRSourceRecorder& recorder, const std::string& request) {
   Answer answer;
   {
     const std::lock_guard lock(mutex_);

@@ -34,7 +34,7 @@ public:
   static void succeed(LMRSourceRecorder& recorder, const std::string& request);
 
 protected:
-  void take(LMRSourceRecorder& recorder, std::string request);
+  void take(LMRSourceRecorder& recorder, const std::string& request);
   void takeStart(LMRSourceRecorder& recorder, double delay);
 
 private:

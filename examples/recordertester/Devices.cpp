@@ -53,8 +53,7 @@ std::shared_ptr<lumora::CaptureDevice> Devices::find(const std::string& text) co
     }
   }
   const std::string count = all.size() == 1 ? "is 1" : "are " + std::to_string(all.size());
-  throw Failure{std::string("There is no ") + kind + " \"" + text + "\" (there " + count +
-                ", which --list tells of)."};
+  throw Failure{std::string("There is no ") + kind + " \"" + text + "\" (there " + count + ", which --list tells of)."};
 }
 
 void listDevices() {

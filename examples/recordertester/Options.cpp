@@ -1,8 +1,8 @@
 #include "Options.h"
 
-#include <CLI/CLI.hpp>
-
 #include <algorithm>
+
+#include <CLI/CLI.hpp>
 
 namespace tester {
 namespace {
