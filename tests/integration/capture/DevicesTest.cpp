@@ -41,6 +41,20 @@ TEST_F(Devices, areFoundByIdentifier_whenPluggedInLater) {
   EXPECT_EQ(error->code(), static_cast<std::int64_t>(CaptureErrorCode::DeviceMissing));
 }
 
+TEST_F(Devices, doNoHarm_whenTheyAreListedWhileACameraRuns) {
+  addCameraAndMicrophone();
+  ASSERT_TRUE(devices_->add("camera", "lumora_other"));
+  run();
+  // Each looks anew.
+  for (int i = 0; i < 3; ++i) {
+    EXPECT_NE(capture().deviceWithUniqueID("video:lumora_other"), nullptr);
+  }
+  ASSERT_TRUE(devices_->remove("lumora_other"));
+  session_->stopRunning();
+  EXPECT_EQ(capture().deviceWithUniqueID("video:lumora_other"), nullptr);
+  ASSERT_EQ(session_->startRunning(), nullptr);
+}
+
 TEST_F(Devices, areRefusedByASession_whenTheyWereNotOpened) {
   const auto device = capture().deviceWithUniqueID("video:lumora_camera");
   const LMRErrorRef error = session_->addInput(capture().makeDeviceInput(device));

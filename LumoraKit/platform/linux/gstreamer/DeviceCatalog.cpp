@@ -3,6 +3,7 @@
 #include <LumoraKit/platform/linux/gstreamer/DelegateCall.h>
 #include <LumoraKit/platform/linux/gstreamer/DeviceCatalog.h>
 #include <LumoraKit/platform/linux/gstreamer/DeviceProbe.h>
+#include <LumoraKit/platform/linux/gstreamer/PipeWireConnection.h>
 #include <LumoraKit/platform/linux/gstreamer/VideoFormat.h>
 #include <LumoraKit/platform/linux/gstreamer/Worker.h>
 
@@ -33,6 +34,7 @@ void prepareVideo(CaptureSource& source, GstDevice& device) {
   // A camera of PipeWire has few buffers and stops for good when they are held.
   if (hasProperty(*source.element, "always-copy")) {
     g_object_set(source.element.get(), "always-copy", TRUE, nullptr);
+    connectApart(*source.element);
   }
   const GstPtr<GstCaps> offered(gst_device_get_caps(&device));
   source.caps = offered ? chooseVideoFormat(*offered) : nullptr;
