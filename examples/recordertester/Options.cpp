@@ -7,6 +7,8 @@
 namespace tester {
 namespace {
 
+constexpr int wrongUse = 2;
+
 constexpr const char* examples = R"(DEVICE is a number or an identifier of --list, a name, or "default".
 
   recordertester --list
@@ -24,14 +26,18 @@ void describe(CLI::App& program, Options& options) {
   program.add_flag("--screen", options.screen, "Record the main screen");
   program.add_option("--screen-microphone", options.screenMicrophone, "Give the screen the sound of a microphone")
       ->needs("--screen");
-  program.add_option("--seconds", options.seconds, "How long, without the pauses", true)
+  program.add_option("--seconds", options.seconds, "How long, without the pauses")
+      ->capture_default_str()
       ->check(CLI::Range(0.5, 86400.0));
   program.add_option("--pause-at", options.pauses, "Pause after so many recorded seconds; once a pause")
       ->allow_extra_args(false)
       ->check(CLI::PositiveNumber);
-  program.add_option("--pause-for", options.pauseLength, "Length of a pause in seconds", true)
+  program.add_option("--pause-for", options.pauseLength, "Length of a pause in seconds")
+      ->capture_default_str()
       ->check(CLI::Range(0.1, 3600.0));
-  program.add_option("--output", options.folder, "Folder for the movie files", true)->check(CLI::ExistingDirectory);
+  program.add_option("--output", options.folder, "Folder for the movie files")
+      ->capture_default_str()
+      ->check(CLI::ExistingDirectory);
 }
 
 void check(Options& options) {
@@ -57,7 +63,7 @@ std::optional<Options> parse(int argc, const char* const* argv, int& status) {
     check(options);
     return options;
   } catch (const CLI::ParseError& end) {
-    status = program.exit(end);
+    status = program.exit(end) == 0 ? 0 : wrongUse;
     return std::nullopt;
   }
 }
