@@ -17,7 +17,7 @@ run_packages=(
 headless_packages=(dbus pipewire pipewire-bin pipewire-pulse wireplumber libspa-0.2-modules xvfb)
 
 demo_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
-test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg polkitd man-db mandoc zsh krb5-kdc krb5-admin-server krb5-user qt6-base-dev)
+test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg polkitd xdg-desktop-portal man-db mandoc zsh krb5-kdc krb5-admin-server krb5-user qt6-base-dev)
 bench_packages=(libbenchmark-dev gstreamer1.0-tools bsdextrautils)
 check_packages=(clang-format-14 git python3)
 lint_packages=(clang-14 clang-tidy-14 libclang-rt-14-dev python3)

@@ -51,6 +51,11 @@ enum class CaptureErrorCode : std::int64_t {
   NothingRecorded = 12,
   /// The file could not be completed in time; what was written stays playable.
   FinishTimedOut = 13,
+  /// The user did not allow the screen to be captured.
+  ScreenRefused = 14,
+  /// The desktop is asking the user for the screen. The question stays open, and the session can be started again:
+  /// that waits for the same answer.
+  ScreenNotAllowedYet = 15,
 };
 
 /// A camera, microphone or muxed device. Its identifier is the same after a restart of the device, the sound server
@@ -182,10 +187,14 @@ public:
 
   /// Starts every device and waits for the first sample of each enabled connection. Blocks for 5 seconds at most.
   /// Null on success; a device that gives no sample in 2 seconds is an error.
+  ///
+  /// Where the desktop asks the user for the screen, the question is put here, and waited for for 3 seconds. Without
+  /// an answer by then the error is ScreenNotAllowedYet, and the question stays until it is answered or stopRunning()
+  /// takes it back. Start again, at any time, to go on waiting; once the user has allowed it the session starts.
   virtual LMRErrorRef startRunning() = 0;
-  /// Stops the devices; a file being written is finished. Safe to call when not running. Returns once the devices
-  /// have stopped; when called from inside a message to an output's delegate (a recorder may die there) it returns at
-  /// once, and they stop afterwards.
+  /// Stops the devices and takes back a question for the screen; a file being written is finished. Safe to call when
+  /// not running. Returns once the devices have stopped; when called from inside a message to an output's delegate (a
+  /// recorder may die there) it returns at once, and they stop afterwards.
   virtual void stopRunning() = 0;
   virtual bool isRunning() const = 0;
 };
@@ -201,7 +210,8 @@ public:
   virtual std::shared_ptr<CaptureDevice> deviceWithUniqueID(const std::string& uniqueID) = 0;
 
   virtual std::shared_ptr<CaptureInput> makeDeviceInput(const std::shared_ptr<CaptureDevice>& device) = 0;
-  /// An input that captures the main screen.
+  /// An input that captures the main screen: of the X server or, on a Wayland desktop, the one that the user chooses.
+  /// The answer holds for the life of the application where the desktop can remember it.
   virtual std::shared_ptr<CaptureInput> makeScreenInput() = 0;
   virtual std::shared_ptr<CaptureSession> makeSession() = 0;
   virtual std::shared_ptr<MovieFileOutput> makeMovieFileOutput() = 0;

@@ -47,6 +47,10 @@ void ChildProgram::writeLine(const std::string& line) {
                             nullptr);
 }
 
+void ChildProgram::signal(int number) {
+  g_subprocess_send_signal(process_.get(), number);
+}
+
 void ChildProgram::kill() {
   g_subprocess_force_exit(process_.get());
   g_subprocess_wait(process_.get(), nullptr, nullptr);

@@ -23,6 +23,8 @@ public:
   /// The next line of its output; empty when the output has ended. Blocks.
   std::string readLine();
   void writeLine(const std::string& line);
+  /// Sends it a signal.
+  void signal(int number);
   /// Kills it, and waits for its end.
   void kill();
 

@@ -2,12 +2,15 @@
 
 #include <LumoraKit/platform/linux/gstreamer/GstPtr.h>
 
+#include <memory>
 #include <string>
 
 namespace lumora::backend {
 
 /// What a device's pipeline begins with.
 struct CaptureSource {
+  /// What the element needs for as long as it runs; null when it needs nothing.
+  std::shared_ptr<void> support;
   GstPtr<GstElement> element;
   /// What is asked of it.
   GstPtr<GstCaps> caps;

@@ -48,7 +48,10 @@ DevicePipeline::DevicePipeline(std::shared_ptr<SourceInput> input, std::shared_p
                                std::shared_ptr<Queues> queues)
     : input_(std::move(input)), connection_(input_->connection()), sink_(std::move(sink)), queues_(std::move(queues)) {}
 
-DevicePipeline::~DevicePipeline() = default;
+// First of all: it reports its own end to the pipeline.
+DevicePipeline::~DevicePipeline() {
+  source_.support.reset();
+}
 
 LMRErrorRef DevicePipeline::start() {
   if (LMRErrorRef error = build()) {
@@ -149,6 +152,7 @@ void DevicePipeline::stop() {
     return;
   }
   gst_element_set_state(pipeline_.get(), GST_STATE_NULL);
+  source_.support.reset();
   if (const unsigned lost = lost_) {
     log("%@ was too busy: %u samples were lost", {name(), text(lost)});
   }

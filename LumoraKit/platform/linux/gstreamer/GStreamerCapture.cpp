@@ -1,7 +1,9 @@
 #include <LumoraKit/platform/linux/Backends.h>
 #include <LumoraKit/platform/linux/gstreamer/DelegateCall.h>
 #include <LumoraKit/platform/linux/gstreamer/Inputs.h>
+#include <LumoraKit/platform/linux/gstreamer/PortalScreenInput.h>
 #include <LumoraKit/platform/linux/gstreamer/Session.h>
+#include <LumoraKit/platform/linux/screencast/ScreenSystem.h>
 
 #include <algorithm>
 #include <mutex>
@@ -14,7 +16,7 @@ class GStreamerCapture final : public MediaCapture {
 public:
   explicit GStreamerCapture(std::shared_ptr<Queues> queues)
       : queues_(std::move(queues)), catalog_(std::make_shared<DeviceCatalog>(queues_)),
-        encoders_(std::make_shared<Encoders>(queues_)) {}
+        encoders_(std::make_shared<Encoders>(queues_)), portal_(std::make_shared<ScreenCastPortal>(queues_)) {}
 
   std::shared_ptr<CaptureDevice> defaultInputDevice(MediaType type) override {
     const std::vector<ListedDevice> devices = list(type);
@@ -47,6 +49,9 @@ public:
 
   std::shared_ptr<CaptureInput> makeScreenInput() override {
     initialize();
+    if (screenSystemOf(DesktopEnvironment::current()) == ScreenSystem::Portal) {
+      return std::make_shared<PortalScreenInput>(portal_);
+    }
     return std::make_shared<ScreenInput>();
   }
 
@@ -77,6 +82,7 @@ private:
   const std::shared_ptr<Queues> queues_;
   const std::shared_ptr<DeviceCatalog> catalog_;
   const std::shared_ptr<Encoders> encoders_;
+  const std::shared_ptr<ScreenCastPortal> portal_;
 };
 
 } // namespace

@@ -74,9 +74,6 @@ std::string ScreenInput::name() const {
 }
 
 LMRErrorRef ScreenInput::check() const {
-  if (!environment("WAYLAND_DISPLAY").empty()) {
-    return captureError(CaptureErrorCode::ScreenUnavailable, "Screens of a Wayland session cannot be captured yet");
-  }
   if (environment("DISPLAY").empty()) {
     return captureError(CaptureErrorCode::ScreenUnavailable, "There is no screen to capture");
   }

@@ -45,6 +45,8 @@ public:
   virtual LMRErrorRef check() const = 0;
   /// A new source for a pipeline. May block for 4 seconds.
   virtual CaptureSource makeSource(LMRErrorRef& error) const = 0;
+  /// Gives up what makeSource() has begun and not yet delivered.
+  virtual void withdraw() {}
 
 private:
   const std::shared_ptr<Connection> connection_;

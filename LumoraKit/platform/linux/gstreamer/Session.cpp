@@ -144,6 +144,9 @@ void Session::stopRunning() {
     for (const auto& output : outputs_) {
       output->recordToOutputFileURL(std::nullopt);
     }
+    for (const auto& input : inputs_) {
+      input->withdraw();
+    }
   }
   if (run) {
     run->stop();
