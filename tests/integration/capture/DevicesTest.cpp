@@ -68,7 +68,7 @@ TEST_F(Devices, areRefusedByASession_whenAddedTwice) {
   EXPECT_EQ(session_->inputs().size(), 1U);
 }
 
-TEST_F(Devices, screenIsRefused_whenTheDesktopIsWayland) {
+TEST_F(Devices, screenIsRefused_whenTheDesktopIsWaylandAndItsPortalOffersNone) {
   ::setenv("WAYLAND_DISPLAY", "wayland-0", 1);
   const LMRErrorRef error = session_->addInput(capture().makeScreenInput());
   ::unsetenv("WAYLAND_DISPLAY");
