@@ -104,7 +104,7 @@ void waitForStart(Store& store, const std::string& name, const Take& take) {
 }
 
 std::int64_t millisecondsFrom(const std::string& name, std::uint64_t delay) {
-  constexpr std::uint64_t day = 24 * 3600;
+  constexpr std::uint64_t day = 86400;
   if (delay > day) {
     refuse(name, "does not wait longer than a day");
   }

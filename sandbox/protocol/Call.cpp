@@ -34,7 +34,7 @@ void takeLogin(std::span<const Element>& elements, ToolKind tool, Credentials& c
   if (kind == "Password") {
     takeUserAndPassword(elements, credentials);
   } else if (kind != "Kerberos") {
-    refuse("the value of the element (\"auth\", ...) is neither \"Password\" nor \"Kerberos\"");
+    refuse(R"(the value of the element ("auth", ...) is neither "Password" nor "Kerberos")");
   }
 }
 

@@ -23,6 +23,7 @@ bool isConfigurationKey(const std::string& key) {
 
 std::vector<std::pair<std::string, std::string>> configuration(Store& store) {
   std::vector<std::pair<std::string, std::string>> all;
+  all.reserve(keys.size());
   for (const auto* key : keys) {
     all.emplace_back(key, valueOf(store, key));
   }

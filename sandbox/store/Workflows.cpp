@@ -53,7 +53,7 @@ std::string addWorkflow(Store& store, const Workflow& workflow) {
   if (findWorkflow(store, workflow.name)) {
     throw std::runtime_error("there is a workflow named " + workflow.name + " already");
   }
-  const std::string uuid = makeUUIDString();
+  std::string uuid = makeUUIDString();
   store.execute("INSERT INTO workflows VALUES (?, ?, ?, ?, ?, ?)", uuid, workflow.name, workflow.title,
                 textOf(workflow.sources), std::int64_t{workflow.isProtected}, currentTime());
   return uuid;

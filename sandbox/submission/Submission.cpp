@@ -189,7 +189,7 @@ Filed fileNow(Store& store, Submission submission) {
 
 std::string fileInBackground(Store& store, Submission submission) {
   auto staging = std::make_unique<Staging>(store);
-  const std::string uuid = staging->uuid();
+  std::string uuid = staging->uuid();
   listUpload(store, uuid, submission);
   store.suspend();
   const pid_t child = fork();

@@ -46,7 +46,7 @@ void refuseOtherKeys(const fs::path& path, const Dictionary& package) {
 
 std::string textUnder(const char* key, const std::string& otherwise, const fs::path& path, const Dictionary& package) {
   const auto* value = package.find(key);
-  const std::string text = value == nullptr ? otherwise : package.string(key).value_or("");
+  std::string text = value == nullptr ? otherwise : package.string(key).value_or("");
   if (text.empty()) {
     refuse(path, std::string("\"") + key + "\" is missing, empty or not a string");
   }
