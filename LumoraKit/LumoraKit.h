@@ -25,6 +25,7 @@
 #include <LumoraKit/platform/Authorization.h>
 #include <LumoraKit/platform/Clock.h>
 #include <LumoraKit/platform/CredentialStore.h>
+#include <LumoraKit/platform/EmbeddedCredentialStore.h>
 #include <LumoraKit/platform/Export.h>
 #include <LumoraKit/platform/Files.h>
 #include <LumoraKit/platform/KTAction.h>

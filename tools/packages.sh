@@ -3,10 +3,14 @@
 build_packages=(
   g++ cmake ninja-build ccache pkg-config
   libglib2.0-dev libexpat1-dev libpugixml-dev libsqlite3-dev libsqlitecpp-dev libsodium-dev libcli11-dev libpng-dev libkrb5-dev
+  libsecret-1-dev
   libgstreamer1.0-dev libgstreamer-plugins-base1.0-dev
   libgtest-dev libgmock-dev
 )
 
+# The library itself brings what it links (libsecret-1-0, libsodium23, ...); passwords are kept where the desktop has a
+# Secret Service, such as gnome-keyring.
+#
 # GStreamer's elements: capture (PipeWire, PulseAudio, X11), encoders and muxers.
 run_packages=(
   gstreamer1.0-plugins-base gstreamer1.0-plugins-good gstreamer1.0-plugins-bad gstreamer1.0-plugins-ugly
@@ -17,8 +21,9 @@ run_packages=(
 headless_packages=(dbus pipewire pipewire-bin pipewire-pulse wireplumber libspa-0.2-modules xvfb)
 
 demo_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
-test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg polkitd xdg-desktop-portal man-db mandoc zsh krb5-kdc krb5-admin-server krb5-user qt6-base-dev)
-bench_packages=(libbenchmark-dev gstreamer1.0-tools bsdextrautils)
+test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg polkitd xdg-desktop-portal man-db mandoc zsh krb5-kdc krb5-admin-server krb5-user qt6-base-dev
+  gnome-keyring)
+bench_packages=(libbenchmark-dev gstreamer1.0-tools bsdextrautils dbus gnome-keyring)
 check_packages=(clang-format-14 git python3)
 lint_packages=(clang-14 clang-tidy-14 libclang-rt-14-dev python3)
 

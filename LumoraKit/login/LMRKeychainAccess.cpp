@@ -4,7 +4,7 @@
 #include <LumoraKit/platform/CredentialStore.h>
 #include <LumoraKit/platform/Log.h>
 #include <LumoraKit/platform/Platform.h>
-#include <LumoraKit/platform/UTF8.h>
+#include <LumoraKit/platform/UnicodeText.h>
 
 #include <vector>
 

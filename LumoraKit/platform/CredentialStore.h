@@ -74,6 +74,9 @@ public:
   virtual LMRErrorRef list(const std::string& service, std::vector<CredentialItem>& items) = 0;
 };
 
+/// Whether a store can keep the text as a service or an account.
+LUMORA_EXPORT bool isCredentialText(std::string_view text);
+
 /// An error of a credential store.
 LUMORA_EXPORT LMRErrorRef credentialError(CredentialError code, std::string description);
 

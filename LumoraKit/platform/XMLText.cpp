@@ -1,5 +1,5 @@
 #include <LumoraKit/platform/Log.h>
-#include <LumoraKit/platform/UTF8.h>
+#include <LumoraKit/platform/UnicodeText.h>
 #include <LumoraKit/platform/XMLText.h>
 
 #include <array>

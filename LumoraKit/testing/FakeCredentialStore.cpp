@@ -1,4 +1,3 @@
-#include <LumoraKit/platform/UTF8.h>
 #include <LumoraKit/testing/FakeCredentialStore.h>
 
 #include <algorithm>
@@ -8,10 +7,6 @@ namespace {
 
 LMRErrorRef fakeError(CredentialError code) {
   return credentialError(code, "the credential store was told to fail");
-}
-
-bool isUsable(const std::string& text) {
-  return utf8::isValid(text) && text.find('\0') == std::string::npos;
 }
 
 } // namespace
@@ -128,7 +123,7 @@ LMRErrorRef FakeCredentialStore::list(const std::string& service, std::vector<Cr
 }
 
 LMRErrorRef FakeCredentialStore::begin(CredentialCall call) {
-  const bool isUnderstood = isUsable(call.service) && isUsable(call.account);
+  const bool isUnderstood = isCredentialText(call.service) && isCredentialText(call.account);
   Script& script = scripts_[call.operation];
   calls_.push_back(std::move(call));
   if (!script.once.empty()) {

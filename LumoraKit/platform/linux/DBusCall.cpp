@@ -7,6 +7,9 @@
 namespace lumora::backend {
 namespace {
 
+// A bus refuses calls when more answers than it likes are missing: 128 where nothing else is configured.
+constexpr std::size_t mostCallsAtOnce = 64;
+
 std::string objectPath(std::string service) {
   std::ranges::replace(service, '.', '/');
   return "/" + service;
@@ -93,25 +96,28 @@ GLibPtr<GVariant> DBusOperation::call(const DBusLink& link, const DBusMethod& me
 std::vector<GLibPtr<GVariant>> DBusOperation::callEach(const DBusLink& link, const std::vector<DBusMethod>& methods,
                                                        GVariant* parameters) {
   struct Answers {
-    std::size_t missing;
+    std::size_t missing = 0;
     std::vector<GLibPtr<GVariant>> values;
-  } answers{methods.size(), std::vector<GLibPtr<GVariant>>(methods.size())};
+  } answers{0, std::vector<GLibPtr<GVariant>>(methods.size())};
   struct Place {
     Answers& answers;
     GLibPtr<GVariant>& value;
   };
+  const auto keep = [](GObject* connection, GAsyncResult* answered, gpointer data) {
+    const std::unique_ptr<Place> place(static_cast<Place*>(data));
+    place->value.reset(g_dbus_connection_call_finish(G_DBUS_CONNECTION(connection), answered, nullptr));
+    --place->answers.missing;
+  };
   const GLibPtr<GVariant> shared(g_variant_ref_sink(parameters));
-  for (std::size_t i = 0; i < methods.size(); ++i) {
-    const auto keep = [](GObject* connection, GAsyncResult* answered, gpointer data) {
-      const std::unique_ptr<Place> place(static_cast<Place*>(data));
-      place->value.reset(g_dbus_connection_call_finish(G_DBUS_CONNECTION(connection), answered, nullptr));
-      --place->answers.missing;
-    };
-    begin(link, methods[i], shared.get(), G_DBUS_CALL_FLAGS_NONE, cancellable_.get(), keep,
-          new Place{answers, answers.values[i]});
-  }
-  while (answers.missing > 0) {
-    g_main_context_iteration(context_.get(), TRUE);
+  for (std::size_t i = 0; i < methods.size() || answers.missing > 0;) {
+    if (i < methods.size() && answers.missing < mostCallsAtOnce) {
+      ++answers.missing;
+      begin(link, methods[i], shared.get(), G_DBUS_CALL_FLAGS_NONE, cancellable_.get(), keep,
+            new Place{answers, answers.values[i]});
+      ++i;
+    } else {
+      g_main_context_iteration(context_.get(), TRUE);
+    }
   }
   return std::move(answers.values);
 }

@@ -1,5 +1,5 @@
 #include "HelperAgentTest.h"
-#include "SilentSocket.h"
+#include "support/SilentSocket.h"
 #include "support/ValuePrinter.h"
 
 #include <gmock/gmock.h>
