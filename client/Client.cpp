@@ -36,7 +36,9 @@ std::string rendered(const Context& context, const Dictionary& reply) {
 
 void runCommand(const CommandLine& line) {
   ActionRunner runner(line);
-  Context context(line, runner, Passwords(line));
+  const Keychain keychain(runner);
+  const auto kept = [&](const std::string& server, const std::string& user) { return keychain.password(server, user); };
+  Context context(line, runner, Passwords(line, line.has("--keychain") ? PasswordStore(kept) : nullptr));
   if (const auto reply = line.command()->run(context)) {
     writeToStandardOutput(rendered(context, *reply));
   }

@@ -16,9 +16,9 @@ namespace {
 constexpr const char* configureOperation = "org.vantor.lumagentconfigd.configure";
 
 std::shared_ptr<LMRAuthenticationAction> loginAction(const CommandLine& line, const Passwords& passwords) {
-  if (line.has("--kerberos") && (line.has("--user") || line.has("--password-file"))) {
-    throw Failure(exitUsage, "With \"--kerberos\" the ticket tells who the user is: leave out \"--user\" and "
-                             "\"--password-file\".");
+  if (line.has("--kerberos") && (line.has("--user") || line.has("--password-file") || line.has("--keychain"))) {
+    throw Failure(exitUsage, "With \"--kerberos\" the ticket tells who the user is: leave out \"--user\", "
+                             "\"--password-file\" and \"--keychain\".");
   }
   const auto address = ServerAddress::of(line);
   if (line.has("--kerberos")) {

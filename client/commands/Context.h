@@ -1,6 +1,7 @@
 #pragma once
 
 #include "../running/ActionRunner.h"
+#include "../running/Keychain.h"
 #include "../running/Passwords.h"
 
 namespace lumora::client {
@@ -13,6 +14,7 @@ public:
 
   const CommandLine& line() const { return line_; }
   const Passwords& passwords() const { return passwords_; }
+  Keychain keychain() const { return Keychain(runner_); }
 
   /// The user's session. The server is not asked: the first action proves the credentials.
   std::shared_ptr<LMRSession> session() const;

@@ -8,6 +8,7 @@
 namespace lumora::client {
 
 std::vector<Command> serverCommands();
+std::vector<Command> passwordCommands();
 std::vector<Command> workflowCommands();
 std::vector<Command> cameraCommands();
 std::vector<Command> submissionCommands();

@@ -20,17 +20,26 @@ const std::vector<Option>& serverOptions() {
   return options;
 }
 
-const std::vector<Option>& passwordOptions() {
+const std::vector<Option>& userOptions() {
   static const std::vector<Option> options{
       {.name = "--user",
        .letter = 'u',
        .value = "NAME",
        .kind = Kind::Text,
        .help = "the user; without it the one that LUMORA_USER names, else the one who is logged in here"},
+  };
+  return options;
+}
+
+const std::vector<Option>& passwordOptions() {
+  static const std::vector<Option> options{
       {.name = "--password-file",
        .value = "FILE",
        .kind = Kind::File,
        .help = "take the password from the first line of a file, - for standard input; without it the terminal is "
+               "asked"},
+      {.name = "--keychain",
+       .help = "take the password from the keychain, where \"lumora password store\" puts it, before the terminal is "
                "asked"},
   };
   return options;
@@ -68,7 +77,7 @@ std::vector<Option> joined(std::initializer_list<const std::vector<Option>*> lis
 const std::vector<Option>& loginOptions() {
   static const std::vector<Option> kerberos{
       {.name = "--kerberos", .help = "log in with the Kerberos ticket (single sign-on), without a password"}};
-  static const auto options = joined({&serverOptions(), &passwordOptions(), &kerberos});
+  static const auto options = joined({&serverOptions(), &userOptions(), &passwordOptions(), &kerberos});
   return options;
 }
 
@@ -90,10 +99,13 @@ std::span<const Option> commonOptions() {
 }
 
 std::span<const Option> connectionOptions(Needs needs) {
-  static const auto passwordLogin = joined({&serverOptions(), &passwordOptions()});
+  static const auto user = joined({&serverOptions(), &userOptions()});
+  static const auto passwordLogin = joined({&serverOptions(), &userOptions(), &passwordOptions()});
   switch (needs) {
   case Needs::Server:
     return serverOptions();
+  case Needs::User:
+    return user;
   case Needs::Login:
     return loginOptions();
   case Needs::PasswordLogin:

@@ -64,7 +64,7 @@ struct Operand {
 
 struct Command {
   /// Which of the connection options the command heeds.
-  enum class Needs { Nothing, Server, Login, PasswordLogin };
+  enum class Needs { Nothing, Server, User, Login, PasswordLogin };
 
   /// One word, or a group and a word.
   std::string_view words;
