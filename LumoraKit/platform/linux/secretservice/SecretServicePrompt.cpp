@@ -3,6 +3,8 @@
 #include "SecretServiceErrors.h"
 #include "SecretServiceNames.h"
 
+#include <utility>
+
 namespace lumora::backend {
 namespace {
 
@@ -13,8 +15,8 @@ LMRErrorRef lockedError(const char* reason) {
 } // namespace
 
 // Subscribed before it is shown: it may be over at once.
-SecretServicePrompt::SecretServicePrompt(DBusOperation& operation, const DBusLink& link, const std::string& path)
-    : operation_(operation), link_(link), path_(path),
+SecretServicePrompt::SecretServicePrompt(DBusOperation& operation, const DBusLink& link, std::string path)
+    : operation_(operation), link_(link), path_(std::move(path)),
       completion_(g_dbus_connection_signal_subscribe(link.connection(), secret_service::serviceName,
                                                      secret_service::promptInterface, "Completed", path_.c_str(),
                                                      nullptr, G_DBUS_SIGNAL_FLAGS_NONE, &completed, this, nullptr)),

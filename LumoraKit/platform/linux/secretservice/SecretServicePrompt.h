@@ -12,7 +12,7 @@ namespace lumora::backend {
 class SecretServicePrompt {
 public:
   /// Both must outlive the prompt.
-  SecretServicePrompt(DBusOperation& operation, const DBusLink& link, const std::string& path);
+  SecretServicePrompt(DBusOperation& operation, const DBusLink& link, std::string path);
   SecretServicePrompt(const SecretServicePrompt&) = delete;
   SecretServicePrompt& operator=(const SecretServicePrompt&) = delete;
   ~SecretServicePrompt();

@@ -7,14 +7,12 @@
 #include <optional>
 #include <string>
 
-using SecretService = struct _SecretService;
-
 namespace lumora::backend {
 
 /// A key that was agreed on with the Secret Service, under which secrets travel.
 class SecretServiceSession {
 public:
-  explicit SecretServiceSession(GLibPtr<SecretService> service);
+  explicit SecretServiceSession(GLibPtr<GObject> service);
   SecretServiceSession(const SecretServiceSession&) = delete;
   SecretServiceSession& operator=(const SecretServiceSession&) = delete;
   ~SecretServiceSession();
@@ -30,7 +28,8 @@ public:
   std::optional<Secret> decoded(GVariant* value) const;
 
 private:
-  GLibPtr<SecretService> service_;
+  /// A SecretService; its library stays out of the headers.
+  GLibPtr<GObject> service_;
 };
 
 } // namespace lumora::backend

@@ -132,8 +132,10 @@ LMRErrorRef SecretServiceStore::list(const std::string& service, std::vector<Cre
   if (!locked) {
     readable.insert(readable.end(), found.locked.begin(), found.locked.end());
   }
-  error = dialogue.openSession();
-  error = error ? error : dialogue.readAll(readable, items);
+  if (!readable.empty()) {
+    error = dialogue.openSession();
+    error = error ? error : dialogue.readAll(readable, items);
+  }
   if (!error && locked) {
     for (const ObjectPath& path : found.locked) {
       items.push_back({path, locked});
