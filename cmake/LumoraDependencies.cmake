@@ -9,6 +9,7 @@ endfunction()
 
 lumora_pkg(GLIB glib-2.0>=2.74 gio-2.0 gobject-2.0)
 lumora_pkg(GSTREAMER gstreamer-1.0>=1.22 gstreamer-app-1.0 gstreamer-audio-1.0 gstreamer-video-1.0)
+lumora_pkg(X11 x11>=1.7)
 lumora_pkg(EXPAT expat)
 lumora_pkg(PUGIXML pugixml)
 lumora_pkg(SQLITE sqlite3)

@@ -3,7 +3,7 @@
 build_packages=(
   g++ cmake ninja-build ccache pkg-config
   libglib2.0-dev libexpat1-dev libpugixml-dev libsqlite3-dev libsqlitecpp-dev libsodium-dev libcli11-dev libpng-dev libkrb5-dev
-  libsecret-1-dev
+  libsecret-1-dev libx11-dev
   libgstreamer1.0-dev libgstreamer-plugins-base1.0-dev
   libgtest-dev libgmock-dev
 )

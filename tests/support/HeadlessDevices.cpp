@@ -94,6 +94,18 @@ bool HeadlessDevices::remove(const std::string& name) {
   return request("remove " + name);
 }
 
+bool HeadlessDevices::freeze(const std::string& name) {
+  return request("freeze " + name);
+}
+
+bool HeadlessDevices::thaw(const std::string& name) {
+  return request("thaw " + name);
+}
+
+bool HeadlessDevices::restart(const std::string& service) {
+  return request("restart " + service);
+}
+
 bool HeadlessDevices::request(const std::string& line) {
   const std::string text = line + "\n";
   return ::write(input_, text.data(), text.size()) == static_cast<ssize_t>(text.size()) && readLine() == "OK";

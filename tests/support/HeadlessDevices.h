@@ -24,6 +24,11 @@ public:
   bool add(const std::string& kind, const std::string& name);
   /// Unplugs a device; true when it is gone. The first ones are "lumora_camera" and "lumora_microphone".
   bool remove(const std::string& name);
+  /// A device or service ("pipewire", "wireplumber", "pipewire-pulse", "Xvfb") hangs, and goes on. Services can be
+  /// removed as well, and restarted.
+  bool freeze(const std::string& name);
+  bool thaw(const std::string& name);
+  bool restart(const std::string& service);
 
 private:
   HeadlessDevices() = default;

@@ -1,4 +1,4 @@
-#include "Movie.h"
+#include "support/Movie.h"
 
 #include <algorithm>
 #include <cstdint>

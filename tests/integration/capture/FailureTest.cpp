@@ -92,6 +92,44 @@ TEST_F(Failure, finishesTheFileWithAnError_whenTheMicrophoneIsRemovedAndAnotherT
   EXPECT_TRUE(Movie(file("a.mov")).decodes());
 }
 
+TEST_F(Failure, finishesTheFileWithAnError_whenTheScreenSessionEnds) {
+  ASSERT_EQ(session_->addInput(capture().makeScreenInput()), nullptr);
+  addDevice("audio:lumora_microphone");
+  run();
+  startAtNextPicture(file("a.mov"));
+  std::this_thread::sleep_for(1500ms);
+  ASSERT_TRUE(devices_->remove("Xvfb"));
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  EXPECT_EQ(delegate_->events(file("a.mov")), "did-start will-finish did-finish");
+  expectError(CaptureErrorCode::DeviceFailed);
+  EXPECT_TRUE(Movie(file("a.mov")).decodes());
+  EXPECT_GT(Movie(file("a.mov")).times("v").size(), 20U);
+}
+
+TEST_F(Failure, finishesTheFileWithAnError_whenTheSoundServerIsRestarted) {
+  addCameraAndMicrophone();
+  run();
+  startAtNextPicture(file("a.mov"));
+  std::this_thread::sleep_for(1s);
+  ASSERT_TRUE(devices_->restart("pipewire-pulse"));
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  EXPECT_EQ(delegate_->events(file("a.mov")), "did-start will-finish did-finish");
+  EXPECT_NE(delegate_->lastError(), nullptr);
+  EXPECT_TRUE(Movie(file("a.mov")).decodes());
+}
+
+TEST_F(Failure, finishesTheFileWithAnError_whenTheMediaServerDies) {
+  addCameraAndMicrophone();
+  run();
+  startAtNextPicture(file("a.mov"));
+  std::this_thread::sleep_for(1s);
+  ASSERT_TRUE(devices_->remove("pipewire"));
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  EXPECT_EQ(delegate_->events(file("a.mov")), "did-start will-finish did-finish");
+  EXPECT_NE(delegate_->lastError(), nullptr);
+  EXPECT_TRUE(Movie(file("a.mov")).decodes());
+}
+
 TEST_F(Failure, sessionDoesNotStart_whenTheCameraGivesNoSample) {
   ASSERT_TRUE(devices_->add("silent-camera", "lumora_silent"));
   addDevice("video:lumora_silent");

@@ -16,6 +16,8 @@ struct CaptureSource {
   GstPtr<GstCaps> caps;
   /// For sound: the name by which the sound server knows the device; empty when it cannot be moved to another one.
   std::string soundDevice;
+  /// Whether it talks to an X server.
+  bool usesXServer = false;
 };
 
 } // namespace lumora::backend

@@ -121,11 +121,19 @@ LMRErrorRef DevicePipeline::play() {
   if (stopping_) {
     return captureError(CaptureErrorCode::DeviceFailed, format("%@ was stopped", {name()}));
   }
-  if (gst_element_set_state(pipeline_.get(), GST_STATE_PLAYING) != GST_STATE_CHANGE_FAILURE) {
+  if (setState(GST_STATE_PLAYING) != GST_STATE_CHANGE_FAILURE) {
     return nullptr;
   }
   const std::lock_guard lock(mutex_);
   return error_ ? error_ : captureError(CaptureErrorCode::DeviceFailed, format("%@ does not start", {name()}));
+}
+
+GstStateChangeReturn DevicePipeline::setState(GstState state) {
+  std::optional<XServerLoss::Observation> observation;
+  if (source_.usesXServer) {
+    observation.emplace(serverLost());
+  }
+  return gst_element_set_state(pipeline_.get(), state);
 }
 
 LMRErrorRef DevicePipeline::awaitFirstSample() {
@@ -148,10 +156,10 @@ void DevicePipeline::stop() {
   }
   changed_.notify_all();
   const std::lock_guard stateLock(stateMutex_);
-  if (!pipeline_) {
+  if (!pipeline_ || stuck_) {
     return;
   }
-  gst_element_set_state(pipeline_.get(), GST_STATE_NULL);
+  setState(GST_STATE_NULL);
   source_.support.reset();
   if (const unsigned lost = lost_) {
     log("%@ was too busy: %u samples were lost", {name(), text(lost)});
@@ -193,6 +201,28 @@ void DevicePipeline::deviceMoved() {
                               format("%@ was replaced by %@", {self->name(), std::string(now.get())})));
     }
   });
+}
+
+// The message is handled on the very thread that begins or ends.
+void DevicePipeline::threadChanged(GstMessage& message) {
+  GstStreamStatusType status = GST_STREAM_STATUS_TYPE_CREATE;
+  gst_message_parse_stream_status(&message, &status, nullptr);
+  if (source_.usesXServer && status == GST_STREAM_STATUS_TYPE_ENTER) {
+    XServerLoss::observe(serverLost());
+  } else if (source_.usesXServer && status == GST_STREAM_STATUS_TYPE_LEAVE) {
+    XServerLoss::observeNoMore();
+  }
+}
+
+XServerLoss::Observer DevicePipeline::serverLost() {
+  return [weak = weak_from_this()] {
+    const auto self = weak.lock();
+    if (self) {
+      self->stuck_ = true;
+      self->fail(captureError(CaptureErrorCode::DeviceFailed, format("The X server of %@ has ended", {self->name()})));
+    }
+    return self;
+  };
 }
 
 GstFlowReturn DevicePipeline::newSample(GstAppSink* sink, gpointer self) {
@@ -238,6 +268,8 @@ GstBusSyncReply DevicePipeline::busMessage(GstBus*, GstMessage* message, gpointe
     self.fail(deviceError(self.name(), *message));
   } else if (GST_MESSAGE_TYPE(message) == GST_MESSAGE_EOS) {
     self.fail(captureError(CaptureErrorCode::DeviceFailed, format("%@ ended", {self.name()})));
+  } else if (GST_MESSAGE_TYPE(message) == GST_MESSAGE_STREAM_STATUS) {
+    self.threadChanged(*message);
   }
   gst_message_unref(message);
   return GST_BUS_DROP;

@@ -3,6 +3,7 @@
 #include <LumoraKit/platform/Queues.h>
 #include <LumoraKit/platform/linux/gstreamer/CapturedSample.h>
 #include <LumoraKit/platform/linux/gstreamer/Inputs.h>
+#include <LumoraKit/platform/linux/gstreamer/XServerLoss.h>
 
 #include <gst/app/gstappsink.h>
 
@@ -49,6 +50,9 @@ private:
   LMRErrorRef silenceError() const;
   void fail(const LMRErrorRef& error);
   void deviceMoved();
+  GstStateChangeReturn setState(GstState state);
+  void threadChanged(GstMessage& message);
+  XServerLoss::Observer serverLost();
 
   GstFlowReturn pull(GstAppSink& sink);
   HostTime timeOf(GstSample& sample) const;
@@ -67,6 +71,8 @@ private:
   // Held while the pipeline's state changes.
   std::mutex stateMutex_;
   std::atomic<bool> stopping_{false};
+  // Its thread has stopped for good, so its state cannot be changed any more.
+  std::atomic<bool> stuck_{false};
 
   std::atomic<HostTime> lastArrival_{0};
   std::atomic<unsigned> lost_{0};

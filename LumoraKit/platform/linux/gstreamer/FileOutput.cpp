@@ -81,7 +81,12 @@ std::shared_ptr<Recording> FileOutput::begin(const std::filesystem::path& file, 
       self->recordingTold(recording, event, error);
     }
   };
-  current_ = std::make_shared<Recording>(RecordingPlan{file, time, planTracks()}, encoders_, observer);
+  current_ = std::make_shared<Recording>(RecordingPlan{file, time, planTracks()}, encoders_, queues_, observer);
+  for (const TrackPlan& track : current_->plan().tracks) {
+    if (const LMRErrorRef failure = track.connection->failure()) {
+      current_->finish(time, failure);
+    }
+  }
   recordings_.push_back(current_);
   offered_.replace(recordings_);
   return current_;

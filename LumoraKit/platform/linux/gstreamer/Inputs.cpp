@@ -88,6 +88,7 @@ CaptureSource ScreenInput::makeSource(LMRErrorRef& error) const {
     error = captureError(CaptureErrorCode::ScreenUnavailable, "The GStreamer plug-in ximagesrc is not installed");
     return source;
   }
+  source.usesXServer = true;
   gst_object_ref_sink(source.element.get());
   g_object_set(source.element.get(), "use-damage", FALSE, nullptr);
   source.caps.reset(gst_caps_from_string(screenFormat));

@@ -20,9 +20,11 @@ constexpr HostTime tailTicks = std::chrono::nanoseconds(patienceForTail).count()
 constexpr std::chrono::seconds patienceForEnd{15};
 constexpr milliseconds tick{20};
 
-// Samples that wait for a slow encoder or disk, before new ones are dropped: two seconds of video, five of sound.
+// Samples that wait until the file is open, before new ones are dropped: two seconds of video, five of sound.
 constexpr std::size_t waitingPictures = 60;
 constexpr std::size_t waitingSounds = 500;
+// And those that wait for a slow encoder: six seconds of a camera.
+constexpr std::uint64_t waitingBytes = 256'000'000;
 
 std::size_t limitOf(MediaType type) {
   return type == MediaType::Video ? waitingPictures : waitingSounds;
@@ -42,13 +44,12 @@ std::vector<std::shared_ptr<CaptureConnection>> RecordingPlan::connections() con
   return result;
 }
 
-Recording::Recording(RecordingPlan plan, std::shared_ptr<Encoders> encoders, Observer observer)
-    : plan_(std::move(plan)), encoders_(std::move(encoders)), observer_(std::move(observer)), timeline_(plan_.start) {
+Recording::Recording(RecordingPlan plan, std::shared_ptr<Encoders> encoders, std::shared_ptr<Queues> queues,
+                     Observer observer)
+    : plan_(std::move(plan)), encoders_(std::move(encoders)), queues_(std::move(queues)),
+      observer_(std::move(observer)), timeline_(plan_.start) {
   for (const TrackPlan& track : plan_.tracks) {
     tracks_.emplace_back().plan = track;
-    if (const LMRErrorRef failure = track.connection->failure()) {
-      finish(plan_.start, failure);
-    }
   }
 }
 
@@ -85,6 +86,10 @@ void Recording::keep(Track& track, const CapturedSample& sample) {
 }
 
 void Recording::encode(Track& track, GstSample& sample, HostTime time) {
+  if (pipeline_->waitingBytes(track.source) >= waitingBytes) {
+    ++track.lost;
+    return;
+  }
   for (const auto& cut : track.media->cut(timeline_, sample, time)) {
     pipeline_->push(track.source, *cut);
   }
@@ -114,9 +119,23 @@ void Recording::resume(HostTime time) {
 
 void Recording::finish(HostTime time, const LMRErrorRef& error) {
   const std::lock_guard lock(mutex_);
+  if (!timeline_.stopTime()) {
+    queues_->runAfter(patienceForEnd, queues_->concurrentQueue(), [weak = weak_from_this()] {
+      if (const auto self = weak.lock()) {
+        self->giveUp();
+      }
+    });
+  }
   timeline_.stop(time);
   reason_ = reason_ ? reason_ : error;
   changed_.notify_all();
+}
+
+// Without effect on a file that is complete. What hangs may hang for ever: nobody waits for it.
+void Recording::giveUp() {
+  givenUp_ = true;
+  tell(RecordingEvent::DidFinish,
+       captureError(CaptureErrorCode::FinishTimedOut, "The file could not be completed within 15 seconds"));
 }
 
 LMRErrorRef Recording::reason() const {
@@ -217,24 +236,21 @@ void Recording::open(std::unique_ptr<RecordingPipeline> pipeline) {
 }
 
 LMRErrorRef Recording::follow() {
-  using Clock = std::chrono::steady_clock;
-  FileFlusher flusher(plan_.file);
-  std::optional<Clock::time_point> deadline;
-  while (true) {
+  const auto flusher = FileFlusher::start(plan_.file, queues_);
+  bool isEnding = false;
+  while (!givenUp_) {
     if (const auto outcome = pipeline_->awaitEnd(tick)) {
-      if (!deadline) {
+      if (!isEnding) {
         tell(RecordingEvent::WillFinish, outcome->error);
       }
       return outcome->error;
     }
-    flusher.flushOnceASecond();
-    if (!deadline && endTracks()) {
-      deadline = Clock::now() + patienceForEnd;
+    if (!isEnding && endTracks()) {
+      isEnding = true;
       tell(RecordingEvent::WillFinish, reason());
-    } else if (deadline && Clock::now() > *deadline) {
-      return captureError(CaptureErrorCode::FinishTimedOut, "The file could not be completed within 15 seconds");
     }
   }
+  return nullptr;
 }
 
 bool Recording::endTracks() {

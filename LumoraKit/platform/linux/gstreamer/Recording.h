@@ -5,6 +5,7 @@
 #include <LumoraKit/platform/linux/gstreamer/MediaTrack.h>
 #include <LumoraKit/platform/linux/gstreamer/RecordingPipeline.h>
 
+#include <atomic>
 #include <condition_variable>
 #include <deque>
 #include <functional>
@@ -29,12 +30,15 @@ enum class RecordingEvent { DidStart, DidPause, DidResume, WillFinish, DidFinish
 
 /// One movie file, from the request to its end. Samples are offered by the devices' threads; those that come before
 /// the encoders are ready wait. Any thread, except run().
-class Recording {
+///
+/// Its end is told within 15 seconds of finish(), also when the encoder or the disk hangs: the file is then given up,
+/// and the thread inside run() is left alone until what it waits for returns.
+class Recording : public std::enable_shared_from_this<Recording> {
 public:
   /// Told what happened, in the order of the events; the error only with the last two.
   using Observer = std::function<void(const Recording&, RecordingEvent, const LMRErrorRef&)>;
 
-  Recording(RecordingPlan plan, std::shared_ptr<Encoders> encoders, Observer observer);
+  Recording(RecordingPlan plan, std::shared_ptr<Encoders> encoders, std::shared_ptr<Queues> queues, Observer observer);
   Recording(const Recording&) = delete;
   Recording& operator=(const Recording&) = delete;
   ~Recording() = default;
@@ -48,7 +52,7 @@ public:
   /// Ends the file at that moment. Only the first time counts, but the first error is kept.
   void finish(HostTime time, const LMRErrorRef& error);
 
-  /// Writes the file: blocks until it is complete or has failed.
+  /// Writes the file: blocks until it is complete or has failed, and for as long as an encoder or the disk hangs.
   void run();
 
 private:
@@ -82,6 +86,7 @@ private:
   void endTrack(Track& track);
   void close();
   LMRErrorRef reason() const;
+  void giveUp();
 
   void keep(Track& track, const CapturedSample& sample);
   void encode(Track& track, GstSample& sample, HostTime time);
@@ -89,6 +94,7 @@ private:
 
   const RecordingPlan plan_;
   const std::shared_ptr<Encoders> encoders_;
+  const std::shared_ptr<Queues> queues_;
   const Observer observer_;
 
   mutable std::mutex mutex_;
@@ -99,6 +105,7 @@ private:
   std::unique_ptr<RecordingPipeline> pipeline_;
   LMRErrorRef reason_;
   bool closed_ = false;
+  std::atomic<bool> givenUp_{false};
 
   // Keeps the events in order: they are told with it held, and before the start they wait here.
   std::mutex eventMutex_;

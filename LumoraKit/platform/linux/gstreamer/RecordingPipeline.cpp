@@ -108,8 +108,8 @@ void RecordingPipeline::endOfStream(std::size_t track) {
   gst_app_src_end_of_stream(GST_APP_SRC(sources_[track].get()));
 }
 
-std::size_t RecordingPipeline::waiting(std::size_t track) const {
-  return gst_app_src_get_current_level_buffers(GST_APP_SRC(sources_[track].get()));
+std::uint64_t RecordingPipeline::waitingBytes(std::size_t track) const {
+  return gst_app_src_get_current_level_bytes(GST_APP_SRC(sources_[track].get()));
 }
 
 std::optional<RecordingPipeline::Outcome> RecordingPipeline::awaitEnd(std::chrono::milliseconds limit) {

@@ -33,8 +33,8 @@ public:
   /// Any thread; never block.
   void push(std::size_t track, GstSample& sample);
   void endOfStream(std::size_t track);
-  /// Samples that the encoder has not taken yet.
-  std::size_t waiting(std::size_t track) const;
+  /// Bytes that the encoder has not taken yet.
+  std::uint64_t waitingBytes(std::size_t track) const;
 
   /// How it ended.
   struct Outcome {
