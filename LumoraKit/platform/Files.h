@@ -2,7 +2,9 @@
 
 #include <LumoraKit/platform/LMRError.h>
 
+#include <cstdint>
 #include <filesystem>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -25,6 +27,9 @@ public:
   virtual LMRErrorRef writeAtomically(const std::filesystem::path& path, std::string_view content) = 0;
   /// Null on success; removing what is not there is an error.
   virtual LMRErrorRef removeFile(const std::filesystem::path& path) = 0;
+  /// The bytes that the user may still write on the file system of that folder; nothing when the system does not tell.
+  /// Blocks for as long as the file system takes to answer.
+  virtual std::optional<std::uint64_t> availableSpace(const std::filesystem::path& folder) = 0;
 };
 
 /// A new random (version 4) UUID in its textual form of RFC 4122, in capital letters. Any thread.

@@ -148,6 +148,9 @@ public:
 
 /// Writes one movie file at a time from a session's connections. Requests return at once; their outcome is a message
 /// to the delegate. Any thread.
+///
+/// The end of a file that is to be finished is told within 15 seconds, whatever hangs: a device, an encoder or the
+/// disk. A file that could not be completed by then has the error FinishTimedOut.
 class LUMORA_EXPORT MovieFileOutput {
 public:
   virtual ~MovieFileOutput();
@@ -172,6 +175,9 @@ public:
   virtual void resumeRecordingAtHostTime(HostTime time);
   /// The file being written; nothing when none is.
   virtual std::optional<std::filesystem::path> outputFileURL() const = 0;
+  /// What a file will take, in bits a second, by the options and the pictures' size: an estimate. Before the session
+  /// runs, the pictures are taken for 1280 x 720.
+  virtual std::uint64_t expectedBitRate() const = 0;
 };
 
 /// Inputs and outputs that run together.

@@ -70,6 +70,16 @@ void FakeFiles::setApplicationSupportDirectories(std::vector<std::filesystem::pa
   applicationSupport_ = std::move(directories);
 }
 
+std::optional<std::uint64_t> FakeFiles::availableSpace(const std::filesystem::path&) {
+  const std::lock_guard lock(mutex_);
+  return availableSpace_;
+}
+
+void FakeFiles::setAvailableSpace(std::optional<std::uint64_t> bytes) {
+  const std::lock_guard lock(mutex_);
+  availableSpace_ = bytes;
+}
+
 void FakeFiles::setFailure(int errorNumber) {
   const std::lock_guard lock(mutex_);
   failure_ = errorNumber;

@@ -22,12 +22,16 @@ public:
   LMRErrorRef createDirectory(const std::filesystem::path& path) override;
   LMRErrorRef writeAtomically(const std::filesystem::path& path, std::string_view content) override;
   LMRErrorRef removeFile(const std::filesystem::path& path) override;
+  std::optional<std::uint64_t> availableSpace(const std::filesystem::path& folder) override;
 
   /// One folder, "/home/user/.local/share", unless set.
   void setApplicationSupportDirectories(std::vector<std::filesystem::path> directories);
   /// While set, whatever would change something fails with this errno: ENOSPC for a full disk, EROFS for one that is
   /// read only. 0 ends it.
   void setFailure(int errorNumber);
+
+  /// A terabyte, in every folder, unless set; what is written does not change it. Nothing: the system does not tell.
+  void setAvailableSpace(std::optional<std::uint64_t> bytes);
 
   /// The content of a file; nothing when there is none.
   std::optional<std::string> content(const std::filesystem::path& path) const;
@@ -43,6 +47,7 @@ private:
   std::set<std::filesystem::path> directories_{"/"};
   std::map<std::filesystem::path, std::string> files_;
   int failure_ = 0;
+  std::optional<std::uint64_t> availableSpace_ = 1'000'000'000'000;
 };
 
 } // namespace lumora::fakes

@@ -94,6 +94,16 @@ void FakeMovieFileOutput::note(HostTime time) {
   requestedHostTimes_.push_back(time);
 }
 
+std::uint64_t FakeMovieFileOutput::expectedBitRate() const {
+  const std::lock_guard lock(mutex_);
+  return expectedBitRate_;
+}
+
+void FakeMovieFileOutput::setExpectedBitRate(std::uint64_t bitRate) {
+  const std::lock_guard lock(mutex_);
+  expectedBitRate_ = bitRate;
+}
+
 std::optional<std::filesystem::path> FakeMovieFileOutput::outputFileURL() const {
   const std::lock_guard lock(mutex_);
   return outputFileURL_;

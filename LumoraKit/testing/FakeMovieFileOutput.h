@@ -55,6 +55,7 @@ public:
   void pauseRecordingAtHostTime(HostTime time) override;
   void resumeRecordingAtHostTime(HostTime time) override;
   std::optional<std::filesystem::path> outputFileURL() const override;
+  std::uint64_t expectedBitRate() const override;
 
   /// Shows a sample to the delegate, on the calling thread. False when nothing was shown: the session is not running,
   /// the connection is disabled or in no input of the session, or the delegate died.
@@ -73,6 +74,9 @@ public:
   void endWithError(LMRErrorRef error);
   /// The same with the error of a full disk.
   void runOutOfDiskSpace();
+
+  /// In bits a second; 4 Mbit/s unless set, whatever the compression options are.
+  void setExpectedBitRate(std::uint64_t bitRate);
 
   /// The requests in their order: "record <file>", "finish", "pause", "resume"; also those that had no effect.
   std::vector<std::string> requests() const;
@@ -110,6 +114,7 @@ private:
   State state_ = State::Idle;
   std::optional<std::filesystem::path> outputFileURL_;
   bool isDelivering_ = false;
+  std::uint64_t expectedBitRate_ = 4'000'000;
 };
 
 } // namespace lumora::fakes

@@ -6,6 +6,7 @@
 #include <cerrno>
 
 #include <sys/stat.h>
+#include <sys/statvfs.h>
 #include <unistd.h>
 
 namespace lumora::backend {
@@ -34,6 +35,14 @@ LMRErrorRef PosixFiles::writeAtomically(const std::filesystem::path& path, std::
 
 LMRErrorRef PosixFiles::removeFile(const std::filesystem::path& path) {
   return unlink(path.c_str()) == 0 ? nullptr : LMRError::fromErrno(errno, path.string());
+}
+
+std::optional<std::uint64_t> PosixFiles::availableSpace(const std::filesystem::path& folder) {
+  struct statvfs system {};
+  if (statvfs(folder.c_str(), &system) != 0) {
+    return std::nullopt;
+  }
+  return std::uint64_t{system.f_bavail} * system.f_frsize;
 }
 
 std::shared_ptr<Files> makeFiles() {

@@ -14,6 +14,7 @@ public:
   LMRErrorRef createDirectory(const std::filesystem::path& path) override;
   LMRErrorRef writeAtomically(const std::filesystem::path& path, std::string_view content) override;
   LMRErrorRef removeFile(const std::filesystem::path& path) override;
+  std::optional<std::uint64_t> availableSpace(const std::filesystem::path& folder) override;
 };
 
 } // namespace lumora::backend

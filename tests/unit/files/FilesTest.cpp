@@ -204,6 +204,18 @@ TEST_F(UserFolder, comesFromUserDatabase_whenEnvironmentIsEmpty) {
   EXPECT_THAT(folders(), ElementsAre(std::filesystem::path(user->pw_dir) / ".local/share"));
 }
 
+TEST(AvailableSpace, isTold_forAFolderThatIsThere) {
+  const TemporaryFolder folder;
+  const auto space = Platform::current().files->availableSpace(folder.path());
+  ASSERT_TRUE(space.has_value());
+  EXPECT_GT(*space, 0U);
+}
+
+TEST(AvailableSpace, isNotTold_forAFolderThatIsMissing) {
+  const TemporaryFolder folder;
+  EXPECT_EQ(Platform::current().files->availableSpace(folder / "missing"), std::nullopt);
+}
+
 TEST(UUIDString, hasFormOfRandomUUIDInCapitals) {
   for (int i = 0; i < 1000; ++i) {
     EXPECT_THAT(makeUUIDString(), MatchesRegex("[0-9A-F]{8}-[0-9A-F]{4}-4[0-9A-F]{3}-[89AB][0-9A-F]{3}-[0-9A-F]{12}"));

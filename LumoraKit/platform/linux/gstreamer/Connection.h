@@ -2,6 +2,7 @@
 
 #include <LumoraKit/platform/MediaCapture.h>
 #include <LumoraKit/platform/Property.h>
+#include <LumoraKit/platform/linux/gstreamer/BitRate.h>
 
 #include <atomic>
 
@@ -16,6 +17,10 @@ public:
   bool isEnabled() const override { return enabled_.load(std::memory_order_relaxed); }
   void setEnabled(bool enabled) override { enabled_.store(enabled, std::memory_order_relaxed); }
 
+  /// Of the pictures that it delivers, or, as long as it has not delivered any, is likely to.
+  PictureSize pictureSize() const { return pictureSize_.get(); }
+  void setPictureSize(PictureSize size) { pictureSize_.set(size); }
+
   /// Why the device gives no samples any more; null while it does.
   LMRErrorRef failure() const { return failure_.get(); }
   void setFailure(LMRErrorRef error) { failure_.set(std::move(error)); }
@@ -24,6 +29,7 @@ private:
   const MediaType type_;
   std::atomic<bool> enabled_{true};
   Property<LMRErrorRef> failure_;
+  Property<PictureSize> pictureSize_{PictureSize{1280, 720}};
 };
 
 } // namespace lumora::backend

@@ -5,6 +5,7 @@
 #include <LumoraKit/platform/linux/gstreamer/Worker.h>
 
 #include <gst/app/gstappsink.h>
+#include <gst/video/video.h>
 
 namespace lumora::backend {
 namespace {
@@ -234,7 +235,7 @@ GstFlowReturn DevicePipeline::pull(GstAppSink& sink) {
   if (!sample) {
     return GST_FLOW_EOS;
   }
-  noteArrival();
+  noteArrival(*sample);
   if (connection_->isEnabled() && !failed_) {
     sink_->take(CapturedSample(*sample, timeOf(*sample)), connection_);
   }
@@ -252,8 +253,12 @@ HostTime DevicePipeline::timeOf(GstSample& sample) const {
   return time + plausibleAge >= now && time <= now + plausibleLead ? time : now;
 }
 
-void DevicePipeline::noteArrival() {
+void DevicePipeline::noteArrival(GstSample& sample) {
   if (lastArrival_.exchange(hostTimeNow()) == 0) {
+    GstVideoInfo info;
+    if (connection_->mediaType() == MediaType::Video && gst_video_info_from_caps(&info, gst_sample_get_caps(&sample))) {
+      connection_->setPictureSize({static_cast<std::uint32_t>(info.width), static_cast<std::uint32_t>(info.height)});
+    }
     {
       const std::lock_guard lock(mutex_);
       firstSampleCame_ = true;

@@ -56,7 +56,7 @@ private:
 
   GstFlowReturn pull(GstAppSink& sink);
   HostTime timeOf(GstSample& sample) const;
-  void noteArrival();
+  void noteArrival(GstSample& sample);
 
   static GstFlowReturn newSample(GstAppSink* sink, gpointer self);
   static GstBusSyncReply busMessage(GstBus* bus, GstMessage* message, gpointer pipeline);

@@ -133,6 +133,15 @@ std::optional<std::filesystem::path> FileOutput::outputFileURL() const {
   return recording ? std::optional(recording->plan().file) : std::nullopt;
 }
 
+std::uint64_t FileOutput::expectedBitRate() const {
+  const std::lock_guard lock(mutex_);
+  std::uint64_t sum = 0;
+  for (const TrackPlan& track : planTracks()) {
+    sum += backend::expectedBitRate(track.connection->mediaType(), track.options, track.connection->pictureSize());
+  }
+  return sum;
+}
+
 void FileOutput::take(const CapturedSample& sample, const std::shared_ptr<Connection>& connection) {
   {
     const DelegateCall call(sample.time());

@@ -27,6 +27,7 @@ public:
   void pauseRecordingAtHostTime(HostTime time) override;
   void resumeRecordingAtHostTime(HostTime time) override;
   std::optional<std::filesystem::path> outputFileURL() const override;
+  std::uint64_t expectedBitRate() const override;
 
   /// For the session: takes the output, unless another session has it; gives it the session's connections; lets it
   /// go, which finishes its file.

@@ -1,4 +1,5 @@
 #include <LumoraKit/platform/Log.h>
+#include <LumoraKit/platform/linux/gstreamer/BitRate.h>
 #include <LumoraKit/platform/linux/gstreamer/CaptureError.h>
 #include <LumoraKit/platform/linux/gstreamer/DelegateCall.h>
 #include <LumoraKit/platform/linux/gstreamer/FileFlusher.h>
@@ -28,10 +29,6 @@ constexpr std::uint64_t waitingBytes = 256'000'000;
 
 std::size_t limitOf(MediaType type) {
   return type == MediaType::Video ? waitingPictures : waitingSounds;
-}
-
-const char* defaultCodec(MediaType type) {
-  return type == MediaType::Video ? "h264" : "aac";
 }
 
 } // namespace
@@ -201,7 +198,7 @@ bool Recording::tailHasCome() const {
 LMRErrorRef Recording::chooseEncoders() {
   for (Track& track : tracks_) {
     const MediaType type = track.plan.connection->mediaType();
-    const std::string codec = track.plan.options.codec.value_or(defaultCodec(type));
+    const std::string codec = codecOf(type, track.plan.options);
     track.encoder = track.ended ? nullptr : encoders_->find(type, codec);
     if (!track.ended && !track.encoder) {
       return captureError(CaptureErrorCode::EncoderMissing, format("No encoder for %@ works here", {codec}));

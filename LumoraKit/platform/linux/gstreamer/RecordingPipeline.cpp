@@ -1,3 +1,4 @@
+#include <LumoraKit/platform/linux/gstreamer/BitRate.h>
 #include <LumoraKit/platform/linux/gstreamer/CaptureError.h>
 #include <LumoraKit/platform/linux/gstreamer/RecordingPipeline.h>
 
@@ -16,11 +17,6 @@ constexpr const char* source =
     " appsrc name=%NAME format=time is-live=true block=false max-bytes=0 max-buffers=0 max-time=0 ! ";
 constexpr const char* toMuxer = " ! queue max-size-time=0 max-size-bytes=0 max-size-buffers=0 ! mux.";
 
-constexpr std::uint32_t soundBitRate = 128'000;
-// 4 Mbit/s at 1280 x 720, in proportion to the picture otherwise.
-constexpr double bitsPerPixelAndSecond = 4'000'000.0 / (1280 * 720);
-constexpr std::uint32_t leastVideoBitRate = 500'000;
-
 constexpr auto outcomes = static_cast<GstMessageType>(GST_MESSAGE_EOS | GST_MESSAGE_ERROR);
 
 std::string sourceName(std::size_t track) {
@@ -32,24 +28,22 @@ std::string sourceName(std::size_t track) {
 std::string videoLine(const TrackFormat& track) {
   GstVideoInfo info;
   gst_video_info_from_caps(&info, track.caps.get());
-  const std::uint32_t width = track.options.width.value_or(static_cast<std::uint32_t>(info.width));
-  const std::uint32_t height = track.options.height.value_or(static_cast<std::uint32_t>(info.height));
-  const auto fitting = static_cast<std::uint32_t>(width * height * bitsPerPixelAndSecond);
-  const std::uint32_t bitRate = track.options.bitRate.value_or(std::max(fitting, leastVideoBitRate));
+  const PictureSize captured{static_cast<std::uint32_t>(info.width), static_cast<std::uint32_t>(info.height)};
+  const PictureSize size = encodedSize(track.options, captured);
+  const std::uint32_t bitRate = wantedBitRate(MediaType::Video, track.options, captured);
   const auto framesASecond =
       info.fps_n > 0 ? static_cast<std::uint32_t>((info.fps_n + info.fps_d / 2) / info.fps_d) : 30;
   const bool isRgb = GST_VIDEO_INFO_IS_RGB(&info);
   const GstPtr<gchar> colorimetry(isRgb ? nullptr : gst_video_colorimetry_to_string(&info.colorimetry));
-  // 4:2:0 pictures have even sides.
   return std::string("videoconvertscale ! video/x-raw,pixel-aspect-ratio=1/1,format=") + track.encoder->rawFormat +
-         ",width=" + std::to_string(width & ~1U) + ",height=" + std::to_string(height & ~1U) +
+         ",width=" + std::to_string(size.width) + ",height=" + std::to_string(size.height) +
          ",colorimetry=" + (colorimetry ? colorimetry.get() : GST_VIDEO_COLORIMETRY_BT709) + " ! " +
          track.encoder->launchLine(bitRate, std::max(framesASecond * 4 / 5, 1U));
 }
 
 std::string soundLine(const TrackFormat& track) {
   return std::string("audioconvert ! audioresample ! audio/x-raw,format=") + track.encoder->rawFormat +
-         ",rate=48000,channels=2 ! " + track.encoder->launchLine(track.options.bitRate.value_or(soundBitRate), 0);
+         ",rate=48000,channels=2 ! " + track.encoder->launchLine(wantedBitRate(MediaType::Sound, track.options, {}), 0);
 }
 
 std::string launchLine(const std::vector<TrackFormat>& tracks) {
