@@ -240,6 +240,40 @@ TEST_F(Recording, endsATrackAndGoesOn_whenItsConnectionIsDisabledMeanwhile) {
   EXPECT_GT(movie.times("v").back(), movie.times("a").back() + 0.5);
 }
 
+// All that came, came during a pause.
+TEST_F(Recording, finishesWithAnError_whenNothingWasCapturedButDuringAPause) {
+  addCameraAndMicrophone();
+  run();
+  delegate_->atNext(MediaType::Video, [this](MovieFileOutput& output) {
+    output.recordToOutputFileURL(file("a.mov"));
+    output.pauseRecording();
+  });
+  std::this_thread::sleep_for(2s);
+  stopAtNextPicture();
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  expectError(CaptureErrorCode::NothingRecorded);
+}
+
+TEST_F(Recording, isPlayable_whenATrackHasSamplesDuringAPauseOnly) {
+  addCameraAndMicrophone();
+  run();
+  delegate_->atNext(MediaType::Video, [this](MovieFileOutput& output) {
+    output.recordToOutputFileURL(file("a.mov"));
+    output.pauseRecording();
+  });
+  std::this_thread::sleep_for(500ms);
+  session_->inputs()[1]->connections()[0]->setEnabled(false);
+  resumeAtNextPicture();
+  std::this_thread::sleep_for(2s);
+  stopAtNextPicture();
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  EXPECT_EQ(delegate_->events(file("a.mov")), "did-start did-pause did-resume will-finish did-finish");
+  EXPECT_EQ(delegate_->lastError(), nullptr);
+  const Movie movie(file("a.mov"));
+  EXPECT_TRUE(movie.decodes());
+  EXPECT_GT(movie.times("v").size(), 45U);
+}
+
 TEST_F(Recording, encodesAsWished_whenCompressionOptionsAreSet) {
   addCameraAndMicrophone();
   ASSERT_EQ(session_->addOutput(output_), nullptr);

@@ -206,14 +206,14 @@ TEST_F(UserFolder, comesFromUserDatabase_whenEnvironmentIsEmpty) {
 
 TEST(AvailableSpace, isTold_forAFolderThatIsThere) {
   const TemporaryFolder folder;
-  const auto space = Platform::current().files->availableSpace(folder.path());
+  const auto space = backend::PosixFiles().availableSpace(folder.path());
   ASSERT_TRUE(space.has_value());
   EXPECT_GT(*space, 0U);
 }
 
 TEST(AvailableSpace, isNotTold_forAFolderThatIsMissing) {
   const TemporaryFolder folder;
-  EXPECT_EQ(Platform::current().files->availableSpace(folder / "missing"), std::nullopt);
+  EXPECT_EQ(backend::PosixFiles().availableSpace(folder / "missing"), std::nullopt);
 }
 
 TEST(UUIDString, hasFormOfRandomUUIDInCapitals) {

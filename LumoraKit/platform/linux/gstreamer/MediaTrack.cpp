@@ -33,6 +33,11 @@ public:
     return result;
   }
 
+  GstPtr<GstSample> filler(GstSample& sample) override {
+    GstPtr<GstBuffer> picture(gst_buffer_copy(gst_sample_get_buffer(&sample)));
+    return makeSample(std::move(picture), steadyCaps(sample), 0, GST_CLOCK_TIME_NONE);
+  }
+
 private:
   // Two pictures never share a time: one that a pause came too late for may lie behind the first one after it.
   std::uint64_t after(std::uint64_t fileTime) {
@@ -77,6 +82,11 @@ public:
       result.push_back(place(region(*buffer, piece), caps, piece.position + piece.silence, piece.count));
     }
     return result;
+  }
+
+  GstPtr<GstSample> filler(GstSample& sample) override {
+    const std::uint64_t frames = gst_buffer_get_size(gst_sample_get_buffer(&sample)) / frameSize();
+    return place(silence(frames), gst_sample_get_caps(&sample), 0, frames);
   }
 
 private:

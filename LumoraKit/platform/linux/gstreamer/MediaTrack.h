@@ -16,6 +16,9 @@ public:
 
   virtual ~MediaTrack() = default;
   virtual Samples cut(const Timeline& timeline, GstSample& sample, HostTime time) = 0;
+  /// What goes at the beginning of a track that would be empty: an empty track makes the whole file unreadable. A
+  /// picture, or a little silence.
+  virtual GstPtr<GstSample> filler(GstSample& sample) = 0;
 };
 
 /// How long a sample lasts, in nanoseconds; 1 for a picture, which is a moment.

@@ -31,6 +31,10 @@ std::size_t limitOf(MediaType type) {
   return type == MediaType::Video ? waitingPictures : waitingSounds;
 }
 
+LMRErrorRef nothingRecorded() {
+  return captureError(CaptureErrorCode::NothingRecorded, "Nothing was recorded");
+}
+
 } // namespace
 
 std::vector<std::shared_ptr<CaptureConnection>> RecordingPlan::connections() const {
@@ -89,6 +93,7 @@ void Recording::encode(Track& track, GstSample& sample, HostTime time) {
   }
   for (const auto& cut : track.media->cut(timeline_, sample, time)) {
     pipeline_->push(track.source, *cut);
+    track.isEmpty = false;
   }
 }
 
@@ -182,7 +187,7 @@ LMRErrorRef Recording::awaitSamples() {
   if (!std::ranges::all_of(tracks_, &Track::ended)) {
     return nullptr;
   }
-  return reason_ ? reason_ : captureError(CaptureErrorCode::NothingRecorded, "Nothing was recorded");
+  return reason_ ? reason_ : nothingRecorded();
 }
 
 bool Recording::haveAllTracks() const {
@@ -218,6 +223,7 @@ std::unique_ptr<RecordingPipeline> Recording::makePipeline() {
     GstSample& sample = *first->sample;
     track.media = MediaTrack::make(track.plan.connection->mediaType(), sample, track.encoder->delay);
     track.source = formats.size();
+    track.first.reset(gst_sample_ref(&sample));
     formats.push_back({track.encoder, track.plan.options, GstPtr<GstCaps>(gst_caps_ref(gst_sample_get_caps(&sample)))});
   }
   return std::make_unique<RecordingPipeline>(plan_.file, formats);
@@ -244,7 +250,11 @@ LMRErrorRef Recording::follow() {
     }
     if (!isEnding && endTracks()) {
       isEnding = true;
-      tell(RecordingEvent::WillFinish, reason());
+      const LMRErrorRef error = isEmpty() ? nothingRecorded() : reason();
+      tell(RecordingEvent::WillFinish, error);
+      if (isEmpty()) {
+        return error;
+      }
     }
   }
   return nullptr;
@@ -263,9 +273,19 @@ bool Recording::endTracks() {
 }
 
 void Recording::endTrack(Track& track) {
-  if (!std::exchange(track.ended, true)) {
-    pipeline_->endOfStream(track.source);
+  if (std::exchange(track.ended, true)) {
+    return;
   }
+  if (track.isEmpty) {
+    pipeline_->push(track.source, *track.media->filler(*track.first));
+  }
+  pipeline_->endOfStream(track.source);
+}
+
+// Everything that came, came during a pause.
+bool Recording::isEmpty() const {
+  const std::lock_guard lock(mutex_);
+  return std::ranges::all_of(tracks_, &Track::isEmpty);
 }
 
 // The pipeline is taken down without the lock: that may take a while, and the devices must not wait.

@@ -66,6 +66,9 @@ private:
     HostTime newest = 0;
     std::size_t waiting = 0;
     unsigned lost = 0;
+    // For a track that stays empty.
+    GstPtr<GstSample> first;
+    bool isEmpty = true;
     bool ended = false;
   };
   struct WaitingSample {
@@ -84,6 +87,7 @@ private:
   LMRErrorRef follow();
   bool endTracks();
   void endTrack(Track& track);
+  bool isEmpty() const;
   void close();
   LMRErrorRef reason() const;
   void giveUp();
