@@ -77,14 +77,14 @@ public:
 private:
   // A dialog that is open.
   struct Dialog {
-    GDBusMethodInvocation* invocation;
+    GDBusMethodInvocation* invocation = nullptr;
     std::string session;
-    guint request;
+    guint request = 0;
   };
   struct Session {
-    guint object;
-    std::uint32_t persistMode;
-    bool isRestored;
+    guint object = 0;
+    std::uint32_t persistMode = 0;
+    bool isRestored = false;
   };
 
   guint serveObject(const char* path, const char* interface);
@@ -178,6 +178,7 @@ void DesktopShell::called(const std::string& object, const std::string& interfac
   if (method == "Start") {
     start(request, session, invocation);
   } else if (mode_ == "hang") {
+    tell("hanging");
     g_object_unref(invocation);
   } else if (method == "CreateSession") {
     createSession(session, invocation);
@@ -203,9 +204,9 @@ void DesktopShell::selectSources(const std::string& path, GVariant* parameters, 
 
 void DesktopShell::start(const char* request, const std::string& path, GDBusMethodInvocation* invocation) {
   const Dialog dialog{invocation, path, serveObject(request, "org.freedesktop.impl.portal.Request")};
-  if (sessions_[path].isRestored) {
+  if (sessions_[path].isRestored && mode_ == "allow") {
     tell("restored");
-    answerDialog(dialog, "allow");
+    answerDialog(dialog, mode_);
     return;
   }
   tell("asked");

@@ -15,7 +15,8 @@ constexpr const char* description = "pipewiresrc name=screen ! videorate skip-to
 constexpr const char* screenFormat = "video/x-raw, framerate=30/1";
 
 GstPtr<GstElement> makeElement(const ScreenStream& stream) {
-  GstPtr<GstElement> bin(gst_parse_bin_from_description(description, TRUE, nullptr));
+  GstPtr<GstElement> bin(
+      gst_parse_bin_from_description_full(description, TRUE, nullptr, GST_PARSE_FLAG_FATAL_ERRORS, nullptr));
   if (!bin) {
     return nullptr;
   }
@@ -75,7 +76,8 @@ CaptureSource PortalScreenInput::makeSource(LMRErrorRef& error) const {
   }
   source.element = makeElement(*stream);
   if (!source.element) {
-    error = captureError(CaptureErrorCode::ScreenUnavailable, "The GStreamer plug-in pipewiresrc is not installed");
+    error = captureError(CaptureErrorCode::ScreenUnavailable,
+                         "The GStreamer plug-ins pipewiresrc and videorate are not installed");
     return source;
   }
   screen->whenEnded(failing(*source.element));

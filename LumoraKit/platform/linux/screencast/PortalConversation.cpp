@@ -131,10 +131,10 @@ void PortalConversation::tell(const std::string& object, const char* interface) 
                          G_DBUS_CALL_FLAGS_NO_AUTO_START, -1, nullptr, nullptr, nullptr);
 }
 
-std::string PortalConversation::requestPath(const std::string& token) const {
+std::string PortalConversation::pathOf(const char* kind, const std::string& token) const {
   std::string sender = g_dbus_connection_get_unique_name(setting_.link->connection()) + 1;
   std::ranges::replace(sender, '.', '_');
-  return std::string(portalObject) + "/request/" + sender + "/" + token;
+  return std::string(portalObject) + "/" + kind + "/" + sender + "/" + token;
 }
 
 // The response may come before the call's own reply, so it is listened for before the call. Old portals choose another
@@ -147,7 +147,7 @@ GLibPtr<GVariant> PortalConversation::request(const char* method, const std::str
     const Subscription::Signal signal{portalName, requestInterface, "Response", path.c_str(), nullptr};
     return std::make_unique<Subscription>(setting_.link->connection(), signal, keep);
   };
-  const std::string expectedPath = requestPath(token);
+  const std::string expectedPath = pathOf("request", token);
   auto subscription = listen(expectedPath);
   const auto answer = call(screenCastInterface, method, parameters, "(o)", error);
   if (!answer) {
@@ -212,9 +212,12 @@ LMRErrorRef PortalConversation::prepare(const std::string& restoreToken) {
 
 LMRErrorRef PortalConversation::createSession() {
   const std::string token = newToken();
+  const std::string sessionToken = newToken();
+  // Known before the answer, so that a session that comes too late is closed as well.
+  session_ = pathOf("session", sessionToken);
   LMRErrorRef error;
   const auto results =
-      request("CreateSession", token, g_variant_new("(@a{sv})", options(token, newToken())), endOfStep(), error);
+      request("CreateSession", token, g_variant_new("(@a{sv})", options(token, sessionToken)), endOfStep(), error);
   if (!results) {
     return error;
   }

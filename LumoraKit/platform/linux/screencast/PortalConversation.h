@@ -55,7 +55,7 @@ private:
   Deadline endOfStep() const;
   LMRErrorRef createSession();
   LMRErrorRef selectSources(const std::string& restoreToken);
-  std::string requestPath(const std::string& token) const;
+  std::string pathOf(const char* kind, const std::string& token) const;
 
   // Makes the context the thread's default one; what is left in it at the end is served.
   class CurrentContext {
