@@ -2,8 +2,6 @@
 
 #include <gmock/gmock.h>
 
-#include <cstdlib>
-
 namespace lumora::testing {
 
 class Devices : public CaptureRig {
@@ -66,14 +64,6 @@ TEST_F(Devices, areRefusedByASession_whenAddedTwice) {
   addDevice("video:lumora_camera");
   EXPECT_NE(session_->addInput(session_->inputs().front()), nullptr);
   EXPECT_EQ(session_->inputs().size(), 1U);
-}
-
-TEST_F(Devices, screenIsRefused_whenTheDesktopIsWaylandAndItsPortalOffersNone) {
-  ::setenv("WAYLAND_DISPLAY", "wayland-0", 1);
-  const LMRErrorRef error = session_->addInput(capture().makeScreenInput());
-  ::unsetenv("WAYLAND_DISPLAY");
-  ASSERT_NE(error, nullptr);
-  EXPECT_EQ(error->code(), static_cast<std::int64_t>(CaptureErrorCode::ScreenUnavailable));
 }
 
 TEST_F(Devices, outputIsRefused_whenItIsInAnotherSession) {
