@@ -1,5 +1,6 @@
-// What recording a camera with a microphone costs in processor time, against the same encoders in a bare pipeline.
-// Both sides take turns on the same headless devices, each in a process of its own, and the medians are compared.
+// What recording a camera with a microphone, and two of them at once, costs in processor time, against the same
+// encoders in bare pipelines. Both sides take turns on the same headless devices, each in a process of its own, and the
+// medians are compared.
 #include "support/Figures.h"
 
 #include <LumoraKit/platform/MediaCapture.h>
@@ -11,6 +12,7 @@
 #include <cmath>
 #include <cstdio>
 #include <cstdlib>
+#include <sstream>
 #include <string_view>
 #include <thread>
 
@@ -27,16 +29,30 @@ constexpr int rounds = 3;
 constexpr HostTime length = 10'000'000'000;
 constexpr const char* devices = LUMORA_SOURCE_DIR "/examples/headless-devices";
 
-// 10 s of 720p30 with sound.
-constexpr const char* barePipeline =
-    "exec gst-launch-1.0 -q pipewiresrc target-object=lumora_camera always-copy=true num-buffers=300 ! "
-    "video/x-raw,width=1280,height=720,framerate=30/1 ! queue ! videoconvertscale ! video/x-raw,format=I420 ! "
-    "x264enc speed-preset=superfast tune=zerolatency key-int-max=24 option-string=scenecut=0 bitrate=4000 ! "
-    "video/x-h264,profile=high ! "
-    "h264parse ! queue ! mux. pulsesrc device=lumora_microphone latency-time=10000 num-buffers=1000 ! "
-    "audio/x-raw,format=S16LE,rate=48000,channels=2 ! queue ! audioconvert ! avenc_aac bitrate=128000 ! aacparse ! "
-    "queue ! mux. qtmux name=mux fragment-duration=800 fragment-mode=dash-or-mss ! "
-    "filesink buffer-mode=unbuffered location=\"$0\"";
+constexpr std::array cameras{"lumora_camera", "lumora_second"};
+
+using Paths = std::vector<std::filesystem::path>;
+
+// 10 s of 720p30 with sound, for each file at once.
+std::string barePipelines(const Paths& files) {
+  std::string script;
+  std::string waits = "true";
+  for (std::size_t i = 0; i < files.size(); ++i) {
+    script +=
+        std::string("gst-launch-1.0 -q pipewiresrc target-object=") + cameras.at(i) +
+        " always-copy=true num-buffers=300 ! "
+        "video/x-raw,width=1280,height=720,framerate=30/1 ! queue ! videoconvertscale ! video/x-raw,format=I420 ! "
+        "x264enc speed-preset=superfast tune=zerolatency key-int-max=24 option-string=scenecut=0 bitrate=4000 ! "
+        "video/x-h264,profile=high ! "
+        "h264parse ! queue ! mux. pulsesrc device=lumora_microphone latency-time=10000 num-buffers=1000 ! "
+        "audio/x-raw,format=S16LE,rate=48000,channels=2 ! queue ! audioconvert ! avenc_aac bitrate=128000 ! "
+        "aacparse ! queue ! mux. qtmux name=mux fragment-duration=800 fragment-mode=dash-or-mss ! "
+        "filesink buffer-mode=unbuffered location='" +
+        files[i].string() + "' & p" + std::to_string(i) + "=$!\n";
+    waits += " && wait $p" + std::to_string(i);
+  }
+  return script + waits;
+}
 
 /// Records 10 seconds as an application does.
 class Recorder final : public MovieFileOutputDelegate {
@@ -98,24 +114,46 @@ private:
   std::exit(EXIT_FAILURE);
 }
 
-// The recording side: prints how many pictures there were to record.
-int record(const std::filesystem::path& file) {
+struct Source {
+  std::shared_ptr<CaptureSession> session;
+  std::shared_ptr<MovieFileOutput> output;
+  std::shared_ptr<Recorder> recorder;
+};
+
+Source open(const char* camera, const std::filesystem::path& file) {
   MediaCapture& capture = *Platform::current().mediaCapture;
-  const auto session = capture.makeSession();
-  for (const char* const name : {"video:lumora_camera", "audio:lumora_microphone"}) {
+  const Source source{capture.makeSession(), capture.makeMovieFileOutput(), std::make_shared<Recorder>(file)};
+  for (const std::string& name : {std::string("video:") + camera, std::string("audio:lumora_microphone")}) {
     const auto device = capture.deviceWithUniqueID(name);
-    if (!device || device->open() || session->addInput(capture.makeDeviceInput(device))) {
+    if (!device || device->open() || source.session->addInput(capture.makeDeviceInput(device))) {
       fail("a device does not open");
     }
   }
-  const auto output = capture.makeMovieFileOutput();
-  const auto recorder = std::make_shared<Recorder>(file);
-  output->setDelegate(recorder);
-  if (session->addOutput(output) || session->startRunning() || !recorder->waitForEnd()) {
-    fail("the recording failed");
+  source.output->setDelegate(source.recorder);
+  if (source.session->addOutput(source.output)) {
+    fail("an output is refused");
   }
-  session->stopRunning();
-  std::printf("%ld\n", recorder->pictures());
+  return source;
+}
+
+// The recording side: prints how many pictures there were to record, a line a file.
+int record(const Paths& files) {
+  std::vector<Source> sources;
+  for (std::size_t i = 0; i < files.size(); ++i) {
+    sources.push_back(open(cameras.at(i), files[i]));
+  }
+  for (const Source& source : sources) {
+    if (source.session->startRunning()) {
+      fail("a session does not start");
+    }
+  }
+  for (const Source& source : sources) {
+    if (!source.recorder->waitForEnd()) {
+      fail("the recording failed");
+    }
+    source.session->stopRunning();
+    std::printf("%ld\n", source.recorder->pictures());
+  }
   return EXIT_SUCCESS;
 }
 
@@ -167,45 +205,69 @@ long picturesIn(const std::filesystem::path& file) {
                        .output.c_str());
 }
 
+struct Comparison {
+  double ratio;
+  long dropped;
+};
+
+double median(std::vector<double> values) {
+  std::ranges::sort(values);
+  return values[values.size() / 2];
+}
+
+Comparison compare(const std::string& self, const Paths& files) {
+  std::vector<std::string> recording{self, "--record"};
+  recording.insert(recording.end(), files.begin(), files.end());
+  std::vector<double> ours;
+  std::vector<double> bare;
+  long dropped = 0;
+  for (int round = 0; round < rounds; ++round) {
+    const Child child = run(recording);
+    std::istringstream pictures(child.output);
+    for (const auto& file : files) {
+      long count = 0;
+      pictures >> count;
+      dropped += std::labs(count - picturesIn(file));
+    }
+    ours.push_back(child.seconds);
+    bare.push_back(run({"sh", "-c", barePipelines(files)}).seconds);
+    std::printf("round %d, %zu sources: %.2f s against %.2f s of processor time\n", round + 1, files.size(),
+                ours.back(), bare.back());
+  }
+  return {median(ours) / median(bare), dropped};
+}
+
 int compare(const std::string& self) {
   std::string folder = std::filesystem::temp_directory_path() / "lumora-bench-XXXXXX";
   if (!::mkdtemp(folder.data())) {
     fail("mkdtemp");
   }
-  const std::filesystem::path file = std::filesystem::path(folder) / "recording.mov";
-  std::vector<double> ours;
-  std::vector<double> bare;
-  long dropped = 0;
-  for (int round = 0; round < rounds; ++round) {
-    const Child child = run({self, "--record", file});
-    dropped += std::labs(std::atol(child.output.c_str()) - picturesIn(file));
-    ours.push_back(child.seconds);
-    bare.push_back(run({"sh", "-c", barePipeline, file}).seconds);
-    std::printf("round %d: %.2f s against %.2f s of processor time\n", round + 1, ours.back(), bare.back());
-  }
+  const std::filesystem::path first = std::filesystem::path(folder) / "first.mov";
+  const Comparison one = compare(self, {first});
+  const Comparison two = compare(self, {first, std::filesystem::path(folder) / "second.mov"});
   std::filesystem::remove_all(folder);
-  std::ranges::sort(ours);
-  std::ranges::sort(bare);
   using bench::Bar;
-  const bool cheap = bench::report("CPU of a 720p30 recording with sound against the same encoders in gst-launch",
-                                   ours[rounds / 2] / bare[rounds / 2], Bar::AtMost, 1.10);
-  const bool complete =
-      bench::report("frames dropped by that recording", static_cast<double>(dropped), Bar::AtMost, 0, "frames");
-  return cheap && complete ? EXIT_SUCCESS : EXIT_FAILURE;
+  bool good = bench::report("CPU of a 720p30 recording with sound against the same encoders in gst-launch", one.ratio,
+                            Bar::AtMost, 1.10);
+  good &= bench::report("frames dropped by that recording", static_cast<double>(one.dropped), Bar::AtMost, 0, "frames");
+  good &=
+      bench::report("CPU of two 720p30 sources with sound against two such pipelines", two.ratio, Bar::AtMost, 1.10);
+  good &= bench::report("frames dropped by those two", static_cast<double>(two.dropped), Bar::AtMost, 0, "frames");
+  return good ? EXIT_SUCCESS : EXIT_FAILURE;
 }
 
 } // namespace
 
 int main(int argc, char** argv) {
   const std::string_view mode = argc > 1 ? argv[1] : "";
-  if (mode == "--record" && argc == 3) {
-    return record(argv[2]);
+  if (mode == "--record") {
+    return record(Paths(argv + 2, argv + argc));
   }
   if (mode == "--compare") {
     return compare("/proc/self/exe");
   }
   // "/proc/self/exe" would be another program in the script.
   const std::string self = std::filesystem::read_symlink("/proc/self/exe");
-  ::execl(devices, devices, self.c_str(), "--compare", nullptr);
+  ::execl(devices, devices, "--add", "camera", cameras.back(), self.c_str(), "--compare", nullptr);
   fail("the headless devices do not start");
 }
