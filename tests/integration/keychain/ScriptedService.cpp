@@ -65,6 +65,7 @@ GVariant* answerOf(const Service& service, const std::string& method) {
 
 void answerPrompt(Service& service, GDBusConnection* connection) {
   if (service.script == "die") {
+    g_dbus_connection_flush_sync(connection, nullptr, nullptr);
     std::_Exit(EXIT_SUCCESS);
   }
   if (service.script == "hang") {
