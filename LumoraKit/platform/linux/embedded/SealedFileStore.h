@@ -17,13 +17,13 @@ namespace lumora::backend {
 class LUMORA_INTERNAL SealedFileStore final : public CredentialStore {
 public:
   /// How long a change waits for its turn.
-  static constexpr std::chrono::milliseconds patience = std::chrono::seconds(5);
+  static constexpr std::chrono::milliseconds defaultPatience = std::chrono::seconds(5);
 
   /// Null, with the error set, when there is none.
   /// \param cost of a new file
   static std::shared_ptr<SealedFileStore> open(const std::filesystem::path& file, const Secret& passphrase,
                                                SealCost cost, LMRErrorRef& error,
-                                               std::chrono::milliseconds patience = SealedFileStore::patience);
+                                               std::chrono::milliseconds patience = defaultPatience);
 
   LMRErrorRef add(const std::string& service, const std::string& account, const Secret& secret) override;
   LMRErrorRef find(const std::string& service, const std::string& account, std::string* handle,
