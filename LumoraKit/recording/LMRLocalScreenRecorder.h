@@ -3,6 +3,8 @@
 #include <LumoraKit/recording/LMRLocalVideoRecorder.h>
 
 /// Records a capture session with the main screen, and a microphone if there is one, into a movie file.
+/// On a Wayland desktop the user is asked for the screen when the session starts to run: see
+/// lumora::CaptureSession::startRunning.
 ///
 ///     LMRErrorRef error;
 ///     auto session = LMRCaptureSessionAdditions::captureSessionWithScreenInputAndAudioDevice_error(

@@ -3,6 +3,8 @@
 
 #include <gmock/gmock.h>
 
+#include <future>
+
 namespace {
 
 using lumora::CaptureErrorCode;
@@ -99,6 +101,16 @@ TEST_F(ScreenDialog, goes_whenTheSessionIsStopped) {
   openDialog();
   session_->stopRunning();
   expectEverythingClosed();
+}
+
+TEST_F(ScreenDialog, goesAndTheStartEnds_whenTheSessionIsStoppedDuringTheStart) {
+  desktop_->order("wait");
+  auto start = std::async(std::launch::async, [this] { return session_->startRunning(); });
+  expectQuestion();
+  session_->stopRunning();
+  expectEverythingClosed();
+  EXPECT_NE(start.get(), nullptr);
+  EXPECT_FALSE(session_->isRunning());
 }
 
 TEST_F(ScreenDialog, goes_whenTheSessionGoes) {
