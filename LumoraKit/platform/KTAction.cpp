@@ -125,10 +125,10 @@ void KTAction::setErrorTarget(std::nullptr_t) {
   setErrorMessage(nullptr);
 }
 
-void KTAction::setFinishMessage(Message message) {
+void KTAction::setFinishMessage(lumora::detail::ActionMessage message) {
   finishMessage_.set(std::move(message));
 }
 
-void KTAction::setErrorMessage(Message message) {
+void KTAction::setErrorMessage(lumora::detail::ActionMessage message) {
   errorMessage_.set(std::move(message));
 }

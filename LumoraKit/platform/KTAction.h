@@ -17,6 +17,43 @@ class KTAction;
 /// Held by whoever starts an action; a started action also keeps itself alive until it has ended.
 using KTActionRef = std::shared_ptr<KTAction>;
 
+namespace lumora::detail {
+
+using ActionMessage = std::function<void(const KTActionRef& action)>;
+
+[[noreturn]] LUMORA_EXPORT void wrongActionClass();
+
+template <class Target, class Class, class Action>
+void sendWithAction(Target& target, void (Class::*selector)(const std::shared_ptr<Action>&),
+                    const KTActionRef& action) {
+  auto received = std::dynamic_pointer_cast<Action>(action);
+  if (!received) {
+    wrongActionClass();
+  }
+  (target.*selector)(received);
+}
+
+/// The message to a target, held weakly: `selector` is as for KTAction::setFinishTarget_selector().
+template <class Target, class Selector>
+ActionMessage actionMessage(const std::shared_ptr<Target>& target, Selector selector) {
+  if (!target) {
+    return nullptr;
+  }
+  return [weak = std::weak_ptr<Target>(target), selector](const KTActionRef& action) {
+    const auto receiver = weak.lock();
+    if (!receiver) {
+      return;
+    }
+    if constexpr (std::is_invocable_v<Selector, Target&>) {
+      ((*receiver).*selector)();
+    } else {
+      sendWithAction(*receiver, selector, action);
+    }
+  };
+}
+
+} // namespace lumora::detail
+
 /// One asynchronous operation that is run once and reports success or failure to a target.
 ///
 /// Without blocking the caller:
@@ -57,11 +94,11 @@ public:
   /// the end counts. Any thread.
   template <class Target, class Selector>
   void setFinishTarget_selector(const std::shared_ptr<Target>& target, Selector selector) {
-    setFinishMessage(message(target, selector));
+    setFinishMessage(lumora::detail::actionMessage(target, selector));
   }
   template <class Target, class Selector>
   void setErrorTarget_selector(const std::shared_ptr<Target>& target, Selector selector) {
-    setErrorMessage(message(target, selector));
+    setErrorMessage(lumora::detail::actionMessage(target, selector));
   }
   /// Clears the target: nobody is told of that outcome.
   void setFinishTarget(std::nullptr_t);
@@ -89,8 +126,6 @@ public:
   void notifyRunningObservers();
 
 protected:
-  using Message = std::function<void(const KTActionRef&)>;
-
   KTAction();
 
   /// Does the work, and sees to it that finish() is called in the end, here or later. Runs on a worker when
@@ -123,17 +158,14 @@ private:
 
   void begin(const char* operation);
   void end();
-  void setFinishMessage(Message message);
-  void setErrorMessage(Message message);
-
-  template <class Target, class Selector>
-  static Message message(const std::shared_ptr<Target>& target, Selector selector);
+  void setFinishMessage(lumora::detail::ActionMessage message);
+  void setErrorMessage(lumora::detail::ActionMessage message);
 
   lumora::Property<LMRErrorRef> error_;
   lumora::Property<std::string> description_;
   lumora::Property<std::optional<lumora::Dictionary>> userInfo_;
-  lumora::Property<Message> finishMessage_;
-  lumora::Property<Message> errorMessage_;
+  lumora::Property<lumora::detail::ActionMessage> finishMessage_;
+  lumora::Property<lumora::detail::ActionMessage> errorMessage_;
   lumora::Notifier runningNotifier_;
   std::atomic<bool> running_{false};
   std::atomic<State> state_{State::Ready};
@@ -142,37 +174,3 @@ private:
   std::shared_ptr<lumora::WorkQueue> endQueue_;
   KTActionRef self_;
 };
-
-namespace lumora::detail {
-
-[[noreturn]] LUMORA_EXPORT void wrongActionClass();
-
-template <class Target, class Class, class Action>
-void sendWithAction(Target& target, void (Class::*selector)(const std::shared_ptr<Action>&),
-                    const KTActionRef& action) {
-  auto received = std::dynamic_pointer_cast<Action>(action);
-  if (!received) {
-    wrongActionClass();
-  }
-  (target.*selector)(received);
-}
-
-} // namespace lumora::detail
-
-template <class Target, class Selector>
-KTAction::Message KTAction::message(const std::shared_ptr<Target>& target, Selector selector) {
-  if (!target) {
-    return nullptr;
-  }
-  return [weak = std::weak_ptr<Target>(target), selector](const KTActionRef& action) {
-    const auto receiver = weak.lock();
-    if (!receiver) {
-      return;
-    }
-    if constexpr (std::is_invocable_v<Selector, Target&>) {
-      ((*receiver).*selector)();
-    } else {
-      lumora::detail::sendWithAction(*receiver, selector, action);
-    }
-  };
-}

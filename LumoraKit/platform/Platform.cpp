@@ -1,6 +1,7 @@
 #include <LumoraKit/platform/Assert.h>
 #include <LumoraKit/platform/NotificationCenter.h>
 #include <LumoraKit/platform/Platform.h>
+#include <LumoraKit/platform/UserInterface.h>
 #include <LumoraKit/platform/linux/Backends.h>
 
 #include <atomic>
@@ -17,21 +18,25 @@ Platform makeMachinePlatform() {
   platform.credentialStore = backend::makeCredentialStore();
   platform.files = backend::makeFiles();
   platform.helperAgent = backend::makeHelperAgent();
+  platform.kerberos = backend::makeKerberos();
   platform.log = backend::makeSystemLog();
   platform.mainThread = backend::makeMainThread();
   platform.notificationCenter = std::make_shared<NotificationCenter>();
   platform.preferences = backend::makePreferences();
   platform.queues = backend::makeQueues(platform.mainThread);
   platform.mediaCapture = backend::makeMediaCapture(platform.queues);
+  platform.serviceDiscovery = backend::makeServiceDiscovery();
   platform.toolRunner = backend::makeToolRunner();
+  platform.userInterface = UserInterface::none();
   platform.wallClock = backend::makeWallClock();
   return platform;
 }
 
 bool isComplete(const Platform& platform) {
-  return platform.application && platform.credentialStore && platform.files && platform.helperAgent && platform.log &&
-         platform.mainThread && platform.mediaCapture && platform.notificationCenter && platform.preferences &&
-         platform.queues && platform.toolRunner && platform.wallClock;
+  return platform.application && platform.credentialStore && platform.files && platform.helperAgent &&
+         platform.kerberos && platform.log && platform.mainThread && platform.mediaCapture &&
+         platform.notificationCenter && platform.preferences && platform.queues && platform.serviceDiscovery &&
+         platform.toolRunner && platform.userInterface && platform.wallClock;
 }
 
 // Every platform that was ever installed stays: references to it are handed out without a count, and a detached

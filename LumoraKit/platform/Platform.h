@@ -10,13 +10,16 @@ class Application;
 class CredentialStore;
 class Files;
 class HelperAgent;
+class Kerberos;
 class Log;
 class MainThread;
 class MediaCapture;
 class NotificationCenter;
 class Preferences;
 class Queues;
+class ServiceDiscovery;
 class ToolRunner;
+class UserInterface;
 class WallClock;
 
 /// The interfaces through which the framework reaches the machine. The one place where they are assembled.
@@ -32,13 +35,16 @@ struct LUMORA_EXPORT Platform {
   std::shared_ptr<CredentialStore> credentialStore;
   std::shared_ptr<Files> files;
   std::shared_ptr<HelperAgent> helperAgent;
+  std::shared_ptr<Kerberos> kerberos;
   std::shared_ptr<Log> log;
   std::shared_ptr<MainThread> mainThread;
   std::shared_ptr<MediaCapture> mediaCapture;
   std::shared_ptr<NotificationCenter> notificationCenter;
   std::shared_ptr<Preferences> preferences;
   std::shared_ptr<Queues> queues;
+  std::shared_ptr<ServiceDiscovery> serviceDiscovery;
   std::shared_ptr<ToolRunner> toolRunner;
+  std::shared_ptr<UserInterface> userInterface;
   std::shared_ptr<WallClock> wallClock;
 
   /// The installed platform; the machine's own one is made on first use. The reference stays valid for the life of

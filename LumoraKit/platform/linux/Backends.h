@@ -13,11 +13,13 @@ class Application;
 class CredentialStore;
 class Files;
 class HelperAgent;
+class Kerberos;
 class Log;
 class MainThread;
 class MediaCapture;
 class Preferences;
 class Queues;
+class ServiceDiscovery;
 class ToolRunner;
 class WallClock;
 
@@ -31,6 +33,8 @@ LUMORA_INTERNAL std::shared_ptr<CredentialStore> makeCredentialStore();
 std::shared_ptr<Files> makeFiles();
 /// The machine's D-Bus services.
 std::shared_ptr<HelperAgent> makeHelperAgent();
+/// The Kerberos 5 library.
+LUMORA_INTERNAL std::shared_ptr<Kerberos> makeKerberos();
 /// syslog(3).
 std::shared_ptr<Log> makeSystemLog();
 /// GLib's default main context.
@@ -41,6 +45,8 @@ LUMORA_INTERNAL std::shared_ptr<MediaCapture> makeMediaCapture(std::shared_ptr<Q
 std::shared_ptr<Preferences> makePreferences();
 /// An elastic pool of threads.
 LUMORA_INTERNAL std::shared_ptr<Queues> makeQueues(std::shared_ptr<MainThread> mainThread);
+/// The machine's discovery daemon.
+LUMORA_INTERNAL std::shared_ptr<ServiceDiscovery> makeServiceDiscovery();
 /// posix_spawn(3), poll(2) and a process descriptor.
 std::shared_ptr<ToolRunner> makeToolRunner();
 /// CLOCK_REALTIME.

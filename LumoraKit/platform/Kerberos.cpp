@@ -1,0 +1,7 @@
+#include <LumoraKit/platform/Kerberos.h>
+
+namespace lumora {
+
+Kerberos::~Kerberos() = default;
+
+} // namespace lumora
