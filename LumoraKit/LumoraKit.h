@@ -20,6 +20,8 @@
 #include <LumoraKit/login/LMRKeychainAccess.h>
 #include <LumoraKit/login/LMRLocalizedString.h>
 #include <LumoraKit/login/LMRPreferenceKeys.h>
+#include <LumoraKit/login/LMRServerLoginSheetController.h>
+#include <LumoraKit/login/LMRServerLoginViewController.h>
 #include <LumoraKit/platform/Application.h>
 #include <LumoraKit/platform/Assert.h>
 #include <LumoraKit/platform/Authorization.h>
@@ -34,6 +36,8 @@
 #include <LumoraKit/platform/KTHelperAgent.h>
 #include <LumoraKit/platform/KTHost.h>
 #include <LumoraKit/platform/KTRunTask.h>
+#include <LumoraKit/platform/KTServiceComboBox.h>
+#include <LumoraKit/platform/Kerberos.h>
 #include <LumoraKit/platform/KeyedArchive.h>
 #include <LumoraKit/platform/LMRError.h>
 #include <LumoraKit/platform/Log.h>
@@ -48,6 +52,8 @@
 #include <LumoraKit/platform/Queues.h>
 #include <LumoraKit/platform/RootedToolRunner.h>
 #include <LumoraKit/platform/Secret.h>
+#include <LumoraKit/platform/ServiceDiscovery.h>
+#include <LumoraKit/platform/UserInterface.h>
 #include <LumoraKit/platform/Value.h>
 #include <LumoraKit/recording/LMRCaptureDeviceAdditions.h>
 #include <LumoraKit/recording/LMRCaptureDeviceInputAdditions.h>
