@@ -16,11 +16,14 @@ void FakePlatform::install() const {
   platform.credentialStore = credentialStore;
   platform.files = files;
   platform.helperAgent = helperAgent;
+  platform.kerberos = kerberos;
   platform.log = log;
   platform.mediaCapture = mediaCapture;
   platform.notificationCenter = notificationCenter;
   platform.preferences = preferences;
+  platform.serviceDiscovery = serviceDiscovery;
   platform.toolRunner = toolRunner;
+  platform.userInterface = userInterface;
   platform.wallClock = wallClock;
   Platform::install(platform);
 }
