@@ -51,8 +51,8 @@ LMRServerLoginSheetController::~LMRServerLoginSheetController() = default;
 
 void LMRServerLoginSheetController::beginSheet(const std::shared_ptr<lumora::Window>& parent,
                                                const std::optional<std::string>& defaultTitle,
-                                               const std::optional<std::string>& alternateTitle, DidEndMessage didEnd,
-                                               const std::any& contextInfo) {
+                                               const std::optional<std::string>& alternateTitle,
+                                               const DidEndMessage& didEnd, const std::any& contextInfo) {
   lumora::assertThat(Platform::current().mainThread->isCurrent(), "on the main thread",
                      "beginSheetModalForWindow:defaultButtonTitle:alternateButtonTitle:modalDelegate:"
                      "didEndSelector:contextInfo:",

@@ -90,7 +90,8 @@ private:
   static DidEndMessage didEndMessage(const std::shared_ptr<Delegate>& delegate, Selector selector);
 
   void beginSheet(const std::shared_ptr<lumora::Window>& parent, const std::optional<std::string>& defaultTitle,
-                  const std::optional<std::string>& alternateTitle, DidEndMessage didEnd, const std::any& contextInfo);
+                  const std::optional<std::string>& alternateTitle, const DidEndMessage& didEnd,
+                  const std::any& contextInfo);
   void endSheet(int returnCode);
   void loadWindow();
   void awakeFromNib();

@@ -245,7 +245,7 @@ bool LMRServerLoginViewController::validateControls() {
     makeFirstResponder(outlets_.userNameTextField);
     return false;
   }
-  if (isEmpty(password())) {
+  if (isPasswordEmpty()) {
     setHidden(outlets_.passwordRequiredImageView, false);
     makeFirstResponder(outlets_.passwordTextField);
     return false;
@@ -258,6 +258,11 @@ bool LMRServerLoginViewController::validateControls() {
 std::optional<std::string> LMRServerLoginViewController::password() const {
   const auto& secret = password_.get();
   return secret ? std::optional(secret->text()) : std::nullopt;
+}
+
+// Without making a copy.
+bool LMRServerLoginViewController::isPasswordEmpty() const {
+  return !password_.get() || password_.get()->text().empty();
 }
 
 void LMRServerLoginViewController::setPassword(std::optional<std::string> password) {

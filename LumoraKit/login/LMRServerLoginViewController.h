@@ -161,6 +161,7 @@ private:
   void continueWithRealm(std::int32_t status, const std::string& realm);
   static bool hasDefaultRealm(std::int32_t status, const std::string& realm);
   bool validateControls();
+  bool isPasswordEmpty() const;
   void showRememberedCredentials();
   void focusFirstCredential();
 

@@ -12,6 +12,7 @@
 #include <LumoraKit/platform/MainThread.h>
 #include <LumoraKit/platform/Platform.h>
 #include <LumoraKit/platform/Queues.h>
+#include <LumoraKit/platform/Secret.h>
 #include <LumoraKit/platform/UnicodeText.h>
 
 #include <algorithm>
@@ -196,12 +197,16 @@ bool LMRServerLoginViewController::hasDefaultRealm(std::int32_t status, const st
 void LMRServerLoginViewController::attemptToLogInToServerWithPassword() {
   lumora::log("Attempting to manually authenticate to '%@:%d' with password",
               {lumora::text(serverHostname()), lumora::text(unsigned{port()})});
+  auto password = this->password();
   // Before the login is proven: a wrong password is remembered too, and replaced by the next one.
   if (rememberPasswordInKeychain() && !isKioskMode() && userName()) {
-    LMRKeychainAccess::storePassword_forUserName_server(password(), userName(), serverHostname());
+    LMRKeychainAccess::storePassword_forUserName_server(password, userName(), serverHostname());
   }
-  startLoginAction(LMRAuthenticationAction::actionWithServer_port_userName_password(serverHostname(), port(),
-                                                                                    userName(), password()));
+  startLoginAction(
+      LMRAuthenticationAction::actionWithServer_port_userName_password(serverHostname(), port(), userName(), password));
+  if (password) {
+    lumora::wipe(*password);
+  }
 }
 
 void LMRServerLoginViewController::attemptToLogInToServerWithSingleSignOnAutomatically(bool automatically) {
@@ -262,5 +267,5 @@ bool LMRServerLoginViewController::attemptButtonEnabled() const {
   if (currentAuthenticationType() == LMRAuthenticationTypeUnknown) {
     return !isEmpty(server());
   }
-  return passwordControlsHidden() || (!isEmpty(userName()) && !isEmpty(password()));
+  return passwordControlsHidden() || (!isEmpty(userName()) && !isPasswordEmpty());
 }
