@@ -1,12 +1,11 @@
 // 64 remote cameras started at once, against one, on a server that answers 200 ms late.
 
+#include "support/CameraStudio.h"
 #include "support/Figures.h"
-#include "support/Sandbox.h"
 
 #include <LumoraKit/actions/LMRAction.h>
 #include <LumoraKit/platform/MainThread.h>
 #include <LumoraKit/platform/Platform.h>
-#include <LumoraKit/platform/RootedToolRunner.h>
 
 #include <benchmark/benchmark.h>
 
@@ -18,27 +17,8 @@
 namespace lumora::bench {
 namespace {
 
-constexpr std::size_t cameraCount = 64;
-constexpr const char* latency = "200";
-
-/// The server with its cameras, and the framework pointed at it.
-class Studio {
+class Studio : CameraStudio {
 public:
-  Studio() {
-    for (std::size_t index = 0; index < cameraCount; ++index) {
-      server_.administrate({"camera", "add"}, {nameOf(index)});
-    }
-    server_.administrate({"inject", "latency"}, {"--command", "start", "--milliseconds", latency});
-    auto platform = Platform::current();
-    platform.toolRunner = std::make_shared<RootedToolRunner>(server_.root(), platform.toolRunner);
-    Platform::install(platform);
-    session_->setServer(tests::SandboxServer::host);
-    session_->setPort(tests::SandboxServer::port);
-    session_->setUserName(tests::SandboxServer::userName);
-    session_->setPassword(tests::SandboxServer::password);
-    session_->setAuthenticationType(LMRAuthenticationTypePassword);
-  }
-
   /// Starts the first cameras at once and waits for the last one; how many starts failed.
   std::size_t start(std::size_t count) const {
     return run(count, [](const std::string& camera) { return Array{Array{"start", camera}, Array{"delay", 0}}; });
@@ -48,14 +28,12 @@ public:
   }
 
 private:
-  static std::string nameOf(std::size_t index) { return "Camera " + std::to_string(index); }
-
   /// Runs one action for each of the first cameras, all at once.
   template <class Arguments> std::size_t run(std::size_t count, const Arguments& argumentsFor) const {
     std::vector<std::shared_ptr<LMRAction>> actions;
     for (std::size_t index = 0; index < count; ++index) {
       actions.push_back(
-          LMRAction::actionWithCommand_arguments_session(std::nullopt, argumentsFor(nameOf(index)), session_));
+          LMRAction::actionWithCommand_arguments_session(std::nullopt, argumentsFor(nameOf(index)), session()));
       actions.back()->start();
     }
     std::size_t failed = 0;
@@ -65,9 +43,6 @@ private:
     }
     return failed;
   }
-
-  tests::SandboxServer server_;
-  std::shared_ptr<LMRSession> session_ = LMRSession::session();
 };
 
 void startCameras(benchmark::State& state) {
@@ -90,7 +65,7 @@ void startCameras(benchmark::State& state) {
 BENCHMARK(lumora::bench::startCameras)
     ->Name("starts")
     ->Arg(1)
-    ->Arg(lumora::bench::cameraCount)
+    ->Arg(lumora::bench::CameraStudio::cameraCount)
     ->UseRealTime()
     ->Unit(benchmark::kMillisecond)
     ->Iterations(1)

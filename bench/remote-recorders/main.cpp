@@ -1,11 +1,10 @@
 // A recording of 64 remote cameras, started as one, against a recording of one, on a server that answers 200 ms late.
 
+#include "support/CameraStudio.h"
 #include "support/Figures.h"
-#include "support/Sandbox.h"
 
 #include <LumoraKit/platform/MainThread.h>
 #include <LumoraKit/platform/Platform.h>
-#include <LumoraKit/platform/RootedToolRunner.h>
 #include <LumoraKit/recording/LMRMultipleSourceRecorder.h>
 #include <LumoraKit/recording/LMRRemoteVideoRecorder.h>
 
@@ -16,56 +15,27 @@
 #include <cstdlib>
 #include <functional>
 #include <memory>
-#include <string>
 #include <utility>
 
 namespace lumora::bench {
 namespace {
 
-constexpr std::size_t cameraCount = 64;
-
-std::string nameOf(std::size_t index) {
-  return "Camera " + std::to_string(index);
+std::shared_ptr<LMRMultipleSourceRecorder> recorderOfTheFirst(std::size_t count, const CameraStudio& studio) {
+  LMRMultipleSourceRecorder::Recorders sources;
+  for (std::size_t index = 0; index < count; ++index) {
+    sources.push_back(
+        LMRRemoteVideoRecorder::recorderWithRemoteRecorderName_session(CameraStudio::nameOf(index), studio.session()));
+  }
+  return LMRMultipleSourceRecorder::recorderWithSourceRecorders(std::move(sources));
 }
-
-/// The server with its cameras, and the framework pointed at it.
-class Studio {
-public:
-  Studio() {
-    for (std::size_t index = 0; index < cameraCount; ++index) {
-      server_.administrate({"camera", "add"}, {nameOf(index)});
-    }
-    server_.administrate({"inject", "latency"}, {"--command", "start", "--milliseconds", "200"});
-    auto platform = Platform::current();
-    platform.toolRunner = std::make_shared<RootedToolRunner>(server_.root(), platform.toolRunner);
-    Platform::install(platform);
-    session_->setServer(tests::SandboxServer::host);
-    session_->setPort(tests::SandboxServer::port);
-    session_->setUserName(tests::SandboxServer::userName);
-    session_->setPassword(tests::SandboxServer::password);
-    session_->setAuthenticationType(LMRAuthenticationTypePassword);
-  }
-
-  std::shared_ptr<LMRMultipleSourceRecorder> recorderOfTheFirst(std::size_t count) const {
-    LMRMultipleSourceRecorder::Recorders sources;
-    for (std::size_t index = 0; index < count; ++index) {
-      sources.push_back(LMRRemoteVideoRecorder::recorderWithRemoteRecorderName_session(nameOf(index), session_));
-    }
-    return LMRMultipleSourceRecorder::recorderWithSourceRecorders(std::move(sources));
-  }
-
-private:
-  tests::SandboxServer server_;
-  std::shared_ptr<LMRSession> session_ = LMRSession::session();
-};
 
 bool serveUntil(const std::function<bool()>& condition) {
   return Platform::current().mainThread->serveUntil(condition, std::chrono::seconds(60));
 }
 
 void startRecording(benchmark::State& state) {
-  static const Studio studio;
-  const auto recorder = studio.recorderOfTheFirst(static_cast<std::size_t>(state.range(0)));
+  static const CameraStudio studio;
+  const auto recorder = recorderOfTheFirst(static_cast<std::size_t>(state.range(0)), studio);
   for ([[maybe_unused]] auto iteration : state) {
     recorder->start();
     const bool isRecording = serveUntil([&] { return recorder->isRecording(); });
@@ -85,7 +55,7 @@ void startRecording(benchmark::State& state) {
 BENCHMARK(lumora::bench::startRecording)
     ->Name("starts")
     ->Arg(1)
-    ->Arg(lumora::bench::cameraCount)
+    ->Arg(lumora::bench::CameraStudio::cameraCount)
     ->UseRealTime()
     ->Unit(benchmark::kMillisecond)
     ->Iterations(1)
