@@ -1,10 +1,7 @@
 #include "SystemBus.h"
 
-#include "MainLoop.h"
-
 #include <cstdlib>
 #include <filesystem>
-#include <thread>
 
 #include <unistd.h>
 
@@ -13,21 +10,12 @@ namespace fs = std::filesystem;
 namespace lumora::tests {
 namespace {
 
-constexpr const char* busProgram = "/usr/bin/dbus-daemon";
 constexpr const char* polkitProgram = "/usr/lib/polkit-1/polkitd";
 constexpr const char* actionsFolder = "/usr/share/polkit-1/actions";
 constexpr const char* rulesFolder = "/etc/polkit-1/rules.d";
 constexpr const char* addressVariable = "DBUS_SYSTEM_BUS_ADDRESS";
 
 constexpr const char* agentFolder = LUMORA_SOURCE_DIR "/sandbox/agent";
-
-constexpr const char* openPolicy = R"(
-  <policy context="default">
-    <allow user="*"/>
-    <allow own="*"/>
-    <allow send_destination="*" eavesdrop="false"/>
-    <allow receive_sender="*"/>
-  </policy>)";
 
 // The rules of a machine's own bus, to which each service adds what it needs.
 constexpr const char* machinePolicy = R"(
@@ -49,17 +37,8 @@ constexpr const char* machinePolicy = R"(
 
 std::string rules(SystemBus::Policy policy) {
   return policy == SystemBus::Policy::Open
-             ? openPolicy
+             ? TestBus::openRules
              : std::string(machinePolicy) + agentFolder + "/org.vantor.lumagentconfigd.conf</include>";
-}
-
-// A bus for everybody on this machine, as the real one is.
-std::string busConfiguration(const fs::path& socket, SystemBus::Policy policy) {
-  return R"(<!DOCTYPE busconfig PUBLIC "-//freedesktop//DTD D-BUS Bus Configuration 1.0//EN"
- "http://www.freedesktop.org/standards/dbus/1.0/busconfig.dtd">
-<busconfig>
-  <listen>unix:path=)" +
-         socket.string() + "</listen>\n  <auth>EXTERNAL</auth>" + rules(policy) + "\n</busconfig>\n";
 }
 
 std::string ruleFor(const std::string& user) {
@@ -75,7 +54,7 @@ std::string ruleFor(const std::string& user) {
 } // namespace
 
 std::optional<std::string> SystemBus::obstacle() {
-  return fs::exists(busProgram) ? std::nullopt : std::optional<std::string>("there is no dbus-daemon");
+  return TestBus::obstacle();
 }
 
 std::optional<std::string> SystemBus::polkitObstacle() {
@@ -93,25 +72,14 @@ std::optional<std::string> SystemBus::polkitObstacle() {
   return std::nullopt;
 }
 
-SystemBus::SystemBus(Policy policy) {
+SystemBus::SystemBus(Policy policy) : bus_(folder_.path(), rules(policy)) {
   // Other users reach the socket, and polkit's own user its files.
   fs::permissions(folder_.path(), fs::perms(0755));
-  writeFile(folder_ / "bus.conf", busConfiguration(folder_ / "bus", policy));
-  ::setenv(addressVariable, ("unix:path=" + (folder_ / "bus").string()).c_str(), 1);
+  ::setenv(addressVariable, bus_.address().c_str(), 1);
 }
 
 SystemBus::~SystemBus() {
   ::unsetenv(addressVariable);
-}
-
-bool SystemBus::start() {
-  bus_ = ChildProgram::start(
-      {busProgram, "--nofork", "--nopidfile", "--print-address=1", "--config-file=" + (folder_ / "bus.conf").string()});
-  return bus_ && !bus_->readLine().empty();
-}
-
-void SystemBus::stop() {
-  bus_->kill();
 }
 
 bool SystemBus::startPolkit(const std::string& allowedUser) {
@@ -129,21 +97,7 @@ bool SystemBus::startPolkit(const std::string& allowedUser) {
   const std::string script = "mount --bind '" + actions.string() + "' " + actionsFolder + " && mount --bind '" +
                              rules.string() + "' " + rulesFolder + " && exec " + polkitProgram + " --no-debug";
   polkit_ = ChildProgram::start({"unshare", "--mount", "sh", "-c", script});
-  return polkit_ && waitForService("org.freedesktop.PolicyKit1");
-}
-
-bool SystemBus::waitForService(const std::string& service) {
-  const auto limit = std::chrono::steady_clock::now() + generousLimit;
-  while (std::chrono::steady_clock::now() < limit) {
-    const auto probe =
-        ChildProgram::start({"dbus-send", "--system", "--print-reply=literal", "--dest=org.freedesktop.DBus",
-                             "/org/freedesktop/DBus", "org.freedesktop.DBus.NameHasOwner", "string:" + service});
-    if (!probe || probe->readLine().find("true") != std::string::npos) {
-      return probe != nullptr;
-    }
-    std::this_thread::sleep_for(std::chrono::milliseconds(10));
-  }
-  return false;
+  return polkit_ && bus_.waitForService("org.freedesktop.PolicyKit1");
 }
 
 } // namespace lumora::tests

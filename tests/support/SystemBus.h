@@ -2,6 +2,7 @@
 
 #include "ChildProgram.h"
 #include "TemporaryFolder.h"
+#include "TestBus.h"
 
 #include <memory>
 #include <optional>
@@ -27,19 +28,17 @@ public:
   ~SystemBus();
 
   /// Each true when the service has come up.
-  bool start();
+  bool start() { return bus_.start(); }
   /// polkitd with the helper agent's action, which it allows to the user of this name without a password, and to no
   /// other but root.
   bool startPolkit(const std::string& allowedUser);
 
   /// Kills the bus.
-  void stop();
+  void stop() { bus_.stop(); }
 
 private:
-  bool waitForService(const std::string& service);
-
   TemporaryFolder folder_;
-  std::unique_ptr<ChildProgram> bus_;
+  TestBus bus_;
   std::unique_ptr<ChildProgram> polkit_;
 };
 

@@ -13,27 +13,8 @@ namespace fs = std::filesystem;
 namespace lumora::tests {
 namespace {
 
-constexpr const char* busProgram = "/usr/bin/dbus-daemon";
 constexpr const char* askProgram = "/usr/bin/dbus-send";
 constexpr const char* serviceProgram = "/usr/bin/gnome-keyring-daemon";
-
-// A session's bus that starts nothing by itself.
-std::string busConfiguration(const fs::path& socket) {
-  return R"(<!DOCTYPE busconfig PUBLIC "-//freedesktop//DTD D-BUS Bus Configuration 1.0//EN"
- "http://www.freedesktop.org/standards/dbus/1.0/busconfig.dtd">
-<busconfig>
-  <listen>unix:path=)" +
-         socket.string() + R"(</listen>
-  <auth>EXTERNAL</auth>
-  <policy context="default">
-    <allow user="*"/>
-    <allow own="*"/>
-    <allow send_destination="*" eavesdrop="false"/>
-    <allow receive_sender="*"/>
-  </policy>
-</busconfig>
-)";
-}
 
 void setVariable(const std::string& name, const std::optional<std::string>& value) {
   if (value) {
@@ -46,20 +27,15 @@ void setVariable(const std::string& name, const std::optional<std::string>& valu
 } // namespace
 
 std::optional<std::string> TestKeyring::obstacle() {
-  for (const char* const program : {busProgram, askProgram, serviceProgram}) {
-    if (!fs::exists(program)) {
-      return "there is no " + std::string(program) + " (packages gnome-keyring and dbus)";
-    }
-  }
-  return std::nullopt;
+  return fs::exists(serviceProgram) ? TestBus::obstacle()
+                                    : "there is no " + std::string(serviceProgram) + " (package gnome-keyring)";
 }
 
 TestKeyring::TestKeyring() {
-  std::map<std::string, std::optional<std::string>> own{
-      {"DBUS_SESSION_BUS_ADDRESS", "unix:path=" + (folder_ / "bus").string()},
-      {"DISPLAY", std::nullopt},
-      {"WAYLAND_DISPLAY", std::nullopt},
-      {"GNOME_KEYRING_CONTROL", std::nullopt}};
+  std::map<std::string, std::optional<std::string>> own{{"DBUS_SESSION_BUS_ADDRESS", bus_.address()},
+                                                        {"DISPLAY", std::nullopt},
+                                                        {"WAYLAND_DISPLAY", std::nullopt},
+                                                        {"GNOME_KEYRING_CONTROL", std::nullopt}};
   for (const char* const variable : {"HOME", "XDG_RUNTIME_DIR", "XDG_DATA_HOME", "XDG_CONFIG_HOME", "XDG_CACHE_HOME"}) {
     fs::create_directory(folder_ / variable);
     fs::permissions(folder_ / variable, fs::perms::owner_all);
@@ -70,7 +46,6 @@ TestKeyring::TestKeyring() {
     environment_[name] = before ? std::optional<std::string>(before) : std::nullopt;
     setVariable(name, value);
   }
-  writeFile(folder_ / "bus.conf", busConfiguration(folder_ / "bus"));
   writeFile(folder_ / "password", "keyring");
 }
 
@@ -84,12 +59,6 @@ TestKeyring::~TestKeyring() {
 
 bool TestKeyring::start() {
   return startBus() && startService();
-}
-
-bool TestKeyring::startBus() {
-  bus_ = ChildProgram::start(
-      {busProgram, "--nofork", "--nopidfile", "--print-address=1", "--config-file=" + (folder_ / "bus.conf").string()});
-  return bus_ && !bus_->readLine().empty();
 }
 
 bool TestKeyring::startService() {
@@ -109,10 +78,6 @@ bool TestKeyring::startServiceWith(const std::string& options) {
 
 void TestKeyring::stopService() {
   service_.reset();
-}
-
-void TestKeyring::stopBus() {
-  bus_.reset();
 }
 
 void TestKeyring::freeze() {

@@ -2,6 +2,7 @@
 
 #include "ChildProgram.h"
 #include "TemporaryFolder.h"
+#include "TestBus.h"
 
 #include <map>
 #include <memory>
@@ -28,7 +29,7 @@ public:
 
   /// The bus, and the service with its default collection unlocked. Each true when it has come up.
   bool start();
-  bool startBus();
+  bool startBus() { return bus_.start(); }
   /// What was stored by an earlier one is there again.
   bool startService();
   /// A service with nothing unlocked: on new folders it has no default collection either.
@@ -36,7 +37,7 @@ public:
 
   /// Kills it.
   void stopService();
-  void stopBus();
+  void stopBus() { bus_.stop(); }
   /// The service does not run until thaw(): its bus takes calls for it, and nobody answers.
   void freeze();
   void thaw();
@@ -52,8 +53,8 @@ private:
   std::string ask(const std::string& object, const std::string& method, const std::string& argument);
 
   TemporaryFolder folder_;
+  TestBus bus_{folder_.path()};
   std::map<std::string, std::optional<std::string>> environment_;
-  std::unique_ptr<ChildProgram> bus_;
   std::unique_ptr<ChildProgram> service_;
 };
 

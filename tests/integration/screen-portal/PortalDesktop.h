@@ -2,6 +2,7 @@
 
 #include "support/ChildProgram.h"
 #include "support/TemporaryFolder.h"
+#include "support/TestBus.h"
 
 #include <memory>
 #include <optional>
@@ -23,7 +24,7 @@ public:
   ~PortalDesktop();
 
   /// Each true when it has come up, in this order; every one may be left out.
-  bool startBus();
+  bool startBus() { return bus_.start(); }
   bool startShell(const std::string& nodeName);
   bool startPortal();
 
@@ -32,14 +33,12 @@ public:
   /// What the shell tells next. Blocks.
   std::string told() { return shell_->readLine(); }
 
-  ChildProgram& bus() { return *bus_; }
+  ChildProgram& bus() { return bus_.program(); }
   ChildProgram& portal() { return *portal_; }
 
 private:
-  bool waitForPortal();
-
   const TemporaryFolder folder_;
-  std::unique_ptr<ChildProgram> bus_;
+  TestBus bus_{folder_.path()};
   std::unique_ptr<ChildProgram> shell_;
   std::unique_ptr<ChildProgram> portal_;
 };
