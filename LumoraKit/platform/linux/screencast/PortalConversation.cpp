@@ -151,6 +151,8 @@ GLibPtr<GVariant> PortalConversation::request(const char* method, const std::str
   auto subscription = listen(expectedPath);
   const auto answer = call(screenCastInterface, method, parameters, "(o)", error);
   if (!answer) {
+    // Not waited for any longer; the request may be there all the same.
+    tell(expectedPath, requestInterface);
     return nullptr;
   }
   const char* path = nullptr;
