@@ -27,8 +27,10 @@ void setVariable(const std::string& name, const std::optional<std::string>& valu
 } // namespace
 
 std::optional<std::string> TestKeyring::obstacle() {
-  return fs::exists(serviceProgram) ? TestBus::obstacle()
-                                    : "there is no " + std::string(serviceProgram) + " (package gnome-keyring)";
+  if (!fs::exists(serviceProgram)) {
+    return "there is no " + std::string(serviceProgram) + " (package gnome-keyring)";
+  }
+  return TestBus::obstacle();
 }
 
 TestKeyring::TestKeyring() {

@@ -31,8 +31,10 @@ std::string nodeNumber(const std::string& name) {
 } // namespace
 
 std::optional<std::string> PortalDesktop::obstacle() {
-  return std::filesystem::exists(portalProgram) ? TestBus::obstacle()
-                                                : std::string(portalProgram) + " is not installed";
+  if (!std::filesystem::exists(portalProgram)) {
+    return std::string("there is no ") + portalProgram;
+  }
+  return TestBus::obstacle();
 }
 
 PortalDesktop::PortalDesktop() {
