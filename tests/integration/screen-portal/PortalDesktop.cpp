@@ -32,7 +32,7 @@ std::string nodeNumber(const std::string& name) {
 
 std::optional<std::string> PortalDesktop::obstacle() {
   if (!std::filesystem::exists(portalProgram)) {
-    return std::string("there is no ") + portalProgram;
+    return "there is no xdg-desktop-portal";
   }
   return TestBus::obstacle();
 }
