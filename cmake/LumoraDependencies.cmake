@@ -16,3 +16,10 @@ lumora_pkg(SQLITE sqlite3)
 lumora_pkg(SODIUM libsodium)
 lumora_pkg(SECRET libsecret-1>=0.20)
 lumora_pkg(KRB5 krb5)
+
+# The library of widgets is left out where Qt is not installed, unless it is asked for.
+find_package(Qt6 6.4 QUIET COMPONENTS Widgets)
+option(LUMORAKIT_QT "Build lumorakit-qt, the login panel as Qt widgets" ${Qt6_FOUND})
+if(LUMORAKIT_QT)
+  find_package(Qt6 6.4 REQUIRED COMPONENTS Widgets)
+endif()

@@ -13,6 +13,12 @@ foreach(header LumoraKit.h ${public_headers} ${fakes})
   install(FILES ${PROJECT_SOURCE_DIR}/LumoraKit/${header} DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/LumoraKit/${folder})
 endforeach()
 
+if(LUMORAKIT_QT)
+  install(TARGETS lumorakit-qt EXPORT LumoraKitTargets)
+  install(FILES ${PROJECT_SOURCE_DIR}/LumoraKit/platform/qt/LumoraKitQt.h
+          DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/LumoraKit/platform/qt)
+endif()
+
 set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/LumoraKit)
 install(EXPORT LumoraKitTargets NAMESPACE LumoraKit:: DESTINATION ${package_dir})
 configure_package_config_file(${CMAKE_CURRENT_LIST_DIR}/LumoraKitConfig.cmake.in
@@ -22,9 +28,15 @@ install(FILES ${PROJECT_BINARY_DIR}/LumoraKitConfig.cmake ${PROJECT_BINARY_DIR}/
         DESTINATION ${package_dir})
 
 # Configured at installation, because the prefix may be given only then.
-install(CODE "set(CMAKE_INSTALL_LIBDIR \"${CMAKE_INSTALL_LIBDIR}\")
+set(pkg_config_files lumorakit)
+if(LUMORAKIT_QT)
+  list(APPEND pkg_config_files lumorakit-qt)
+endif()
+foreach(file ${pkg_config_files})
+  install(CODE "set(CMAKE_INSTALL_LIBDIR \"${CMAKE_INSTALL_LIBDIR}\")
 set(CMAKE_INSTALL_INCLUDEDIR \"${CMAKE_INSTALL_INCLUDEDIR}\")
 set(PROJECT_VERSION \"${PROJECT_VERSION}\")
 set(PROJECT_DESCRIPTION \"${PROJECT_DESCRIPTION}\")
-configure_file(\"${CMAKE_CURRENT_LIST_DIR}/lumorakit.pc.in\"
-               \"\$ENV{DESTDIR}\${CMAKE_INSTALL_PREFIX}/${CMAKE_INSTALL_LIBDIR}/pkgconfig/lumorakit.pc\" @ONLY)")
+configure_file(\"${CMAKE_CURRENT_LIST_DIR}/${file}.pc.in\"
+               \"\$ENV{DESTDIR}\${CMAKE_INSTALL_PREFIX}/${CMAKE_INSTALL_LIBDIR}/pkgconfig/${file}.pc\" @ONLY)")
+endforeach()

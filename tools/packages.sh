@@ -5,6 +5,7 @@ build_packages=(
   libglib2.0-dev libexpat1-dev libpugixml-dev libsqlite3-dev libsqlitecpp-dev libsodium-dev libcli11-dev libpng-dev libkrb5-dev
   libsecret-1-dev libx11-dev
   libgstreamer1.0-dev libgstreamer-plugins-base1.0-dev
+  qt6-base-dev
   libgtest-dev libgmock-dev
 )
 
@@ -21,7 +22,7 @@ run_packages=(
 headless_packages=(dbus pipewire pipewire-bin pipewire-pulse wireplumber libspa-0.2-modules xvfb)
 
 demo_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
-test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg polkitd xdg-desktop-portal man-db mandoc zsh krb5-kdc krb5-admin-server krb5-user qt6-base-dev
+test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg polkitd xdg-desktop-portal man-db mandoc zsh krb5-kdc krb5-admin-server krb5-user
   gnome-keyring)
 bench_packages=(libbenchmark-dev libpipewire-0.3-dev gstreamer1.0-tools bsdextrautils dbus gnome-keyring)
 check_packages=(clang-format-14 git python3)

@@ -76,6 +76,11 @@ Installed& installed() {
 
 } // namespace
 
+void Platform::setMainThread(std::shared_ptr<MainThread> newMainThread) {
+  mainThread = std::move(newMainThread);
+  queues = backend::makeQueues(mainThread);
+}
+
 const Platform& Platform::current() {
   return installed().current();
 }

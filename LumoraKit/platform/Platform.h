@@ -47,6 +47,10 @@ struct LUMORA_EXPORT Platform {
   std::shared_ptr<UserInterface> userInterface;
   std::shared_ptr<WallClock> wallClock;
 
+  /// Puts another main thread in, and with it queues of the machine whose main queue it serves: for an application
+  /// whose loop does not serve the machine's.
+  void setMainThread(std::shared_ptr<MainThread> newMainThread);
+
   /// The installed platform; the machine's own one is made on first use. The reference stays valid for the life of
   /// the process, also after another one has been installed. Any thread.
   static const Platform& current();
