@@ -109,8 +109,9 @@ bool DesignLayout::eventFilter(QObject* /*watched*/, QEvent* event) {
     apply();
     break;
   case QEvent::ChildRemoved:
-    std::erase_if(
-        items_, [child = static_cast<QChildEvent*>(event)->child()](const Item& item) { return item.widget == child; });
+    std::erase_if(items_, [child = dynamic_cast<QChildEvent&>(*event).child()](const Item& item) {
+      return item.widget == child;
+    });
     break;
   default:
     break;

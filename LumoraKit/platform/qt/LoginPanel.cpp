@@ -52,7 +52,7 @@ void placeHorizontally(DesignLayout& layout, const QWidget* child, double left, 
 LoginPanel::LoginPanel(const std::shared_ptr<LMRServerLoginViewController>& owner)
     : owner_(owner), ui_(std::make_unique<Ui::ServerLoginView>()) {
   ui_->setupUi(this);
-  layout_ = new DesignLayout(this);
+  new DesignLayout(this); // its host owns it
   setFocusProxy(ui_->serverComboBox);
   ui_->passwordTextField->setInputMethodHints(Qt::ImhHiddenText | Qt::ImhSensitiveData | Qt::ImhNoPredictiveText |
                                               Qt::ImhNoAutoUppercase);
@@ -171,29 +171,30 @@ void LoginPanel::reportUserName(const std::shared_ptr<TextField>& field) {
 void LoginPanel::fitLabelColumn() {
   const std::array<QLabel*, 3> labels{ui_->serverLabelTextField, ui_->userNameLabelTextField,
                                       ui_->passwordLabelTextField};
+  DesignLayout& layout = *DesignLayout::of(this);
   double width = narrowestLabels;
   for (const QLabel* const label : labels) {
     width = std::max(width, neededBy(*label) + 2);
   }
   for (const QLabel* const label : labels) {
-    placeHorizontally(*layout_, label, margin, margin + width);
+    placeHorizontally(layout, label, margin, margin + width);
   }
   const double left = margin + width + gap;
   for (QWidget* const field : std::array<QWidget*, 4>{ui_->serverComboBox, ui_->userNameTextField,
                                                       ui_->passwordTextField, ui_->rememberPasswordInKeychainButton}) {
-    placeHorizontally(*layout_, field, left, layout_->frame(field).right());
+    placeHorizontally(layout, field, left, layout.frame(field).right());
   }
 }
 
 double LoginPanel::neededWidth() const {
-  const double fieldsLeft = layout_->frame(ui_->serverComboBox).left();
+  const double fieldsLeft = DesignLayout::of(this)->frame(ui_->serverComboBox).left();
   return std::max(fieldsLeft + narrowestFields + markerColumn,
                   fieldsLeft + neededBy(*ui_->rememberPasswordInKeychainButton) + checkBoxMargin);
 }
 
 void LoginPanel::changeEvent(QEvent* event) {
   QWidget::changeEvent(event);
-  if (!layout_) {
+  if (!DesignLayout::of(this)) {
     return;
   }
   if (event->type() == QEvent::LanguageChange) {

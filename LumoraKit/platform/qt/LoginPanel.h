@@ -18,8 +18,6 @@ class ServerLoginView;
 
 namespace lumora::qt {
 
-class DesignLayout;
-
 /// The interface file "ServerLoginView" with its bindings. The panel of an owner that died stays, and reports nothing.
 class LoginPanel final : public QWidget {
 public:
@@ -48,7 +46,6 @@ private:
 
   const std::weak_ptr<LMRServerLoginViewController> owner_;
   const std::unique_ptr<Ui::ServerLoginView> ui_;
-  DesignLayout* layout_ = nullptr;
   std::vector<Connection> bindings_;
 };
 
