@@ -68,4 +68,6 @@
 #include <LumoraKit/recording/LMRRemoteVideoRecorder.h>
 #include <LumoraKit/recording/LMRSourceRecorder.h>
 #include <LumoraKit/recording/LMRSourceRecorderDelegate.h>
+#include <LumoraKit/workflows/LMRSubmission.h>
+#include <LumoraKit/workflows/LMRSubmissionQueue.h>
 #include <LumoraKit/workflows/LMRWorkflowAdditions.h>

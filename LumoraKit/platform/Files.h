@@ -4,6 +4,7 @@
 
 #include <cstdint>
 #include <filesystem>
+#include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -20,6 +21,17 @@ public:
   /// are none.
   virtual std::vector<std::filesystem::path> applicationSupportDirectories() = 0;
   virtual bool isDirectory(const std::filesystem::path& path) = 0;
+  /// Whether a file of whatever kind that is not a folder is there.
+  virtual bool isFile(const std::filesystem::path& path) = 0;
+  /// The full paths of what is in a folder, sorted; empty, with the error set, when it cannot be listed.
+  virtual std::vector<std::filesystem::path> contentsOfDirectory(const std::filesystem::path& path,
+                                                                 LMRErrorRef* error) = 0;
+  /// The whole content; nothing, with the error set, when it cannot be read.
+  virtual std::optional<std::string> contentOfFile(const std::filesystem::path& path, LMRErrorRef* error) = 0;
+  /// Takes a lock that one holder among all processes has until the result goes; the file is there for nothing else,
+  /// is made when it is missing, and stays. Null, with the error set, when somebody has it already (EWOULDBLOCK) or
+  /// the file cannot be made. Returns at once.
+  virtual std::shared_ptr<void> lockFile(const std::filesystem::path& path, LMRErrorRef* error) = 0;
   /// Makes the folder with every missing parent. Null on success, also when it is there already.
   virtual LMRErrorRef createDirectory(const std::filesystem::path& path) = 0;
   /// Writes the whole content under a temporary name, then moves it into place: at any moment the path holds the old

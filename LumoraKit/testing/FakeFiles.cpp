@@ -15,6 +15,12 @@ LMRErrorRef errorUnlessZero(int errorNumber, const std::filesystem::path& path) 
   return errorNumber == 0 ? nullptr : LMRError::fromErrno(errorNumber, path.string());
 }
 
+void report(LMRErrorRef* error, int errorNumber, const std::filesystem::path& path) {
+  if (error) {
+    *error = LMRError::fromErrno(errorNumber, path.string());
+  }
+}
+
 } // namespace
 
 FakeFiles::FakeFiles() : applicationSupport_{"/home/user/.local/share"} {}
@@ -28,6 +34,48 @@ std::vector<std::filesystem::path> FakeFiles::applicationSupportDirectories() {
 bool FakeFiles::isDirectory(const std::filesystem::path& path) {
   const std::lock_guard lock(mutex_);
   return hasDirectory(cleaned(path));
+}
+
+bool FakeFiles::isFile(const std::filesystem::path& path) {
+  const std::lock_guard lock(mutex_);
+  return files_.contains(cleaned(path));
+}
+
+std::vector<std::filesystem::path> FakeFiles::contentsOfDirectory(const std::filesystem::path& path,
+                                                                  LMRErrorRef* error) {
+  const std::lock_guard lock(mutex_);
+  const auto clean = cleaned(path);
+  if (!hasDirectory(clean)) {
+    report(error, ENOENT, path);
+    return {};
+  }
+  std::set<std::filesystem::path> contents;
+  for (const auto& [file, content] : files_) {
+    contents.insert(file);
+  }
+  contents.insert(directories_.begin(), directories_.end());
+  std::erase_if(contents, [&](const auto& entry) { return entry == clean || entry.parent_path() != clean; });
+  return {contents.begin(), contents.end()};
+}
+
+std::optional<std::string> FakeFiles::contentOfFile(const std::filesystem::path& path, LMRErrorRef* error) {
+  auto found = content(path);
+  if (!found) {
+    report(error, ENOENT, path);
+  }
+  return found;
+}
+
+std::shared_ptr<void> FakeFiles::lockFile(const std::filesystem::path& path, LMRErrorRef* error) {
+  const std::lock_guard lock(mutex_);
+  std::weak_ptr<void>& holder = locks_[cleaned(path)];
+  if (!holder.expired() || failure_ != 0) {
+    report(error, failure_ != 0 ? failure_ : EWOULDBLOCK, path);
+    return nullptr;
+  }
+  auto taken = std::make_shared<int>();
+  holder = taken;
+  return taken;
 }
 
 LMRErrorRef FakeFiles::createDirectory(const std::filesystem::path& path) {

@@ -19,6 +19,11 @@ public:
 
   std::vector<std::filesystem::path> applicationSupportDirectories() override;
   bool isDirectory(const std::filesystem::path& path) override;
+  bool isFile(const std::filesystem::path& path) override;
+  std::vector<std::filesystem::path> contentsOfDirectory(const std::filesystem::path& path,
+                                                         LMRErrorRef* error) override;
+  std::optional<std::string> contentOfFile(const std::filesystem::path& path, LMRErrorRef* error) override;
+  std::shared_ptr<void> lockFile(const std::filesystem::path& path, LMRErrorRef* error) override;
   LMRErrorRef createDirectory(const std::filesystem::path& path) override;
   LMRErrorRef writeAtomically(const std::filesystem::path& path, std::string_view content) override;
   LMRErrorRef removeFile(const std::filesystem::path& path) override;
@@ -46,6 +51,7 @@ private:
   std::vector<std::filesystem::path> applicationSupport_;
   std::set<std::filesystem::path> directories_{"/"};
   std::map<std::filesystem::path, std::string> files_;
+  std::map<std::filesystem::path, std::weak_ptr<void>> locks_;
   int failure_ = 0;
   std::optional<std::uint64_t> availableSpace_ = 1'000'000'000'000;
 };

@@ -1,9 +1,12 @@
 #include <LumoraKit/platform/linux/AtomicFile.h>
 #include <LumoraKit/platform/linux/Backends.h>
+#include <LumoraKit/platform/linux/FileLock.h>
 #include <LumoraKit/platform/linux/PosixFiles.h>
 #include <LumoraKit/platform/linux/UserFolders.h>
 
+#include <algorithm>
 #include <cerrno>
+#include <system_error>
 
 #include <sys/stat.h>
 #include <sys/statvfs.h>
@@ -14,6 +17,12 @@ namespace {
 
 constexpr mode_t defaultPermissions = 0777;
 
+void report(LMRErrorRef* error, int errorNumber, const std::filesystem::path& path) {
+  if (error) {
+    *error = LMRError::fromErrno(errorNumber, path.string());
+  }
+}
+
 } // namespace
 
 std::vector<std::filesystem::path> PosixFiles::applicationSupportDirectories() {
@@ -23,6 +32,44 @@ std::vector<std::filesystem::path> PosixFiles::applicationSupportDirectories() {
 
 bool PosixFiles::isDirectory(const std::filesystem::path& path) {
   return isExistingDirectory(path);
+}
+
+bool PosixFiles::isFile(const std::filesystem::path& path) {
+  struct stat facts {};
+  return stat(path.c_str(), &facts) == 0 && !S_ISDIR(facts.st_mode);
+}
+
+std::vector<std::filesystem::path> PosixFiles::contentsOfDirectory(const std::filesystem::path& path,
+                                                                   LMRErrorRef* error) {
+  std::vector<std::filesystem::path> contents;
+  std::error_code failure;
+  for (std::filesystem::directory_iterator at(path, failure), end; !failure && at != end; at.increment(failure)) {
+    contents.push_back(at->path());
+  }
+  if (failure) {
+    report(error, failure.value(), path);
+    return {};
+  }
+  std::ranges::sort(contents);
+  return contents;
+}
+
+std::optional<std::string> PosixFiles::contentOfFile(const std::filesystem::path& path, LMRErrorRef* error) {
+  auto content = backend::contentOfFile(path);
+  if (!content) {
+    report(error, errno, path);
+  }
+  return content;
+}
+
+std::shared_ptr<void> PosixFiles::lockFile(const std::filesystem::path& path, LMRErrorRef* error) {
+  auto lock = std::make_shared<FileLock>();
+  const LMRErrorRef failure = lock->take(path, FileLock::Time::min());
+  if (!failure) {
+    return lock;
+  }
+  report(error, failure->code() == ETIMEDOUT ? EWOULDBLOCK : static_cast<int>(failure->code()), path);
+  return nullptr;
 }
 
 LMRErrorRef PosixFiles::createDirectory(const std::filesystem::path& path) {

@@ -11,6 +11,11 @@ public:
   /// The XDG data folder.
   std::vector<std::filesystem::path> applicationSupportDirectories() override;
   bool isDirectory(const std::filesystem::path& path) override;
+  bool isFile(const std::filesystem::path& path) override;
+  std::vector<std::filesystem::path> contentsOfDirectory(const std::filesystem::path& path,
+                                                         LMRErrorRef* error) override;
+  std::optional<std::string> contentOfFile(const std::filesystem::path& path, LMRErrorRef* error) override;
+  std::shared_ptr<void> lockFile(const std::filesystem::path& path, LMRErrorRef* error) override;
   LMRErrorRef createDirectory(const std::filesystem::path& path) override;
   LMRErrorRef writeAtomically(const std::filesystem::path& path, std::string_view content) override;
   LMRErrorRef removeFile(const std::filesystem::path& path) override;

@@ -50,6 +50,45 @@ TEST_F(PosixFilesTest, writesContentReadableByUserOnly) {
   EXPECT_EQ(entries(), 1U);
 }
 
+TEST_F(PosixFilesTest, readsFile) {
+  writeFile(folder_ / "file", "content");
+  LMRErrorRef error;
+  EXPECT_EQ(files_.contentOfFile(folder_ / "file", &error), "content");
+  EXPECT_EQ(error, nullptr);
+  EXPECT_EQ(files_.contentOfFile(folder_ / "missing", &error), std::nullopt);
+  ASSERT_NE(error, nullptr);
+  EXPECT_EQ(error->code(), ENOENT);
+}
+
+TEST_F(PosixFilesTest, listsFolder) {
+  writeFile(folder_ / "b", "");
+  writeFile(folder_ / "a", "");
+  std::filesystem::create_directory(folder_ / "c");
+  LMRErrorRef error;
+  EXPECT_THAT(files_.contentsOfDirectory(folder_.path(), &error),
+              ElementsAre(folder_ / "a", folder_ / "b", folder_ / "c"));
+  EXPECT_EQ(error, nullptr);
+  EXPECT_TRUE(files_.isFile(folder_ / "a"));
+  EXPECT_FALSE(files_.isFile(folder_ / "c"));
+  EXPECT_FALSE(files_.isFile(folder_ / "d"));
+  EXPECT_THAT(files_.contentsOfDirectory(folder_ / "a", &error), testing::IsEmpty());
+  ASSERT_NE(error, nullptr);
+  EXPECT_EQ(error->code(), ENOTDIR);
+}
+
+TEST_F(PosixFilesTest, locksFileForOneHolder) {
+  LMRErrorRef error;
+  auto lock = files_.lockFile(folder_ / "lock", &error);
+  ASSERT_NE(lock, nullptr);
+  EXPECT_EQ(files_.lockFile(folder_ / "lock", &error), nullptr);
+  ASSERT_NE(error, nullptr);
+  EXPECT_EQ(error->code(), EWOULDBLOCK);
+  lock.reset();
+  EXPECT_NE(files_.lockFile(folder_ / "lock", &error), nullptr);
+  EXPECT_EQ(files_.lockFile(folder_ / "missing" / "lock", &error), nullptr);
+  EXPECT_EQ(error->code(), ENOENT);
+}
+
 TEST_F(PosixFilesTest, replacesFile) {
   const auto path = folder_ / "file";
   writeFile(path, "a longer content than the new one");
