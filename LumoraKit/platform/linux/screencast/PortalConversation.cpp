@@ -46,36 +46,6 @@ GVariant* options(const std::string& handleToken, const std::string& sessionToke
 
 } // namespace
 
-// A handler for one signal of one object, for as long as it lives.
-class PortalConversation::Subscription {
-public:
-  struct Signal {
-    const char* sender;
-    const char* interface;
-    const char* name;
-    const char* object;
-    const char* firstArgument;
-  };
-
-  Subscription(GDBusConnection* connection, const Signal& signal, Handler handler)
-      : connection_(connection), handler_(std::move(handler)),
-        id_(g_dbus_connection_signal_subscribe(connection_, signal.sender, signal.interface, signal.name, signal.object,
-                                               signal.firstArgument, G_DBUS_SIGNAL_FLAGS_NONE, &told, this, nullptr)) {}
-  Subscription(const Subscription&) = delete;
-  Subscription& operator=(const Subscription&) = delete;
-  ~Subscription() { g_dbus_connection_signal_unsubscribe(connection_, id_); }
-
-private:
-  static void told(GDBusConnection* /*connection*/, const gchar* /*sender*/, const gchar* /*object*/,
-                   const gchar* /*interface*/, const gchar* /*signal*/, GVariant* arguments, gpointer self) {
-    static_cast<Subscription*>(self)->handler_(*arguments);
-  }
-
-  GDBusConnection* connection_;
-  Handler handler_;
-  guint id_;
-};
-
 PortalConversation::CurrentContext::CurrentContext(GMainContext* context) : context_(context) {
   g_main_context_push_thread_default(context_);
 }
@@ -88,10 +58,10 @@ PortalConversation::CurrentContext::~CurrentContext() {
 
 PortalConversation::PortalConversation(Setting setting)
     : setting_(std::move(setting)), current_(setting_.context), tick_(attachTick(setting_.context)) {
-  const Subscription::Signal ownerChanged{"org.freedesktop.DBus", "org.freedesktop.DBus", "NameOwnerChanged",
-                                          "/org/freedesktop/DBus", portalName};
+  const DBusSignal ownerChanged{"org.freedesktop.DBus", "org.freedesktop.DBus", "NameOwnerChanged",
+                                "/org/freedesktop/DBus", portalName};
   ownerChanged_ =
-      std::make_unique<Subscription>(setting_.link->connection(), ownerChanged, [this](GVariant& arguments) {
+      std::make_unique<DBusSubscription>(setting_.link->connection(), ownerChanged, [this](GVariant& arguments) {
         const char* before = "";
         g_variant_get_child(&arguments, 1, "&s", &before);
         portalIsGone_ = portalIsGone_ || *before != '\0';
@@ -144,8 +114,8 @@ GLibPtr<GVariant> PortalConversation::request(const char* method, const std::str
   std::optional<PortalResponse> response;
   const auto keep = [&](GVariant& arguments) { response = portalResponse(arguments); };
   const auto listen = [&](const std::string& path) {
-    const Subscription::Signal signal{portalName, requestInterface, "Response", path.c_str(), nullptr};
-    return std::make_unique<Subscription>(setting_.link->connection(), signal, keep);
+    const DBusSignal signal{portalName, requestInterface, "Response", path.c_str(), nullptr};
+    return std::make_unique<DBusSubscription>(setting_.link->connection(), signal, keep);
   };
   const std::string expectedPath = pathOf("request", token);
   auto subscription = listen(expectedPath);
@@ -227,9 +197,9 @@ LMRErrorRef PortalConversation::createSession() {
   if (session_.empty()) {
     return screenError(CaptureErrorCode::DeviceFailed, "The desktop's portal did not name its session");
   }
-  const Subscription::Signal closed{portalName, sessionInterface, "Closed", session_.c_str(), nullptr};
-  closed_ = std::make_unique<Subscription>(setting_.link->connection(), closed,
-                                           [this](GVariant& /*arguments*/) { sessionIsClosed_ = true; });
+  const DBusSignal closed{portalName, sessionInterface, "Closed", session_.c_str(), nullptr};
+  closed_ = std::make_unique<DBusSubscription>(setting_.link->connection(), closed,
+                                               [this](GVariant& /*arguments*/) { sessionIsClosed_ = true; });
   return nullptr;
 }
 

@@ -2,6 +2,7 @@
 
 #include <LumoraKit/platform/MediaCapture.h>
 #include <LumoraKit/platform/linux/DBusCall.h>
+#include <LumoraKit/platform/linux/DBusSubscription.h>
 #include <LumoraKit/platform/linux/FileDescriptor.h>
 #include <LumoraKit/platform/linux/screencast/PortalReplies.h>
 
@@ -43,7 +44,6 @@ public:
   FileDescriptor takeRemote() { return std::move(remote_); }
 
 private:
-  using Handler = std::function<void(GVariant& arguments)>;
   using Deadline = std::optional<std::chrono::steady_clock::time_point>;
 
   GLibPtr<GVariant> call(const char* interface, const char* method, GVariant* parameters, const char* replyType,
@@ -69,8 +69,6 @@ private:
     GMainContext* const context_;
   };
 
-  class Subscription;
-
   const Setting setting_;
   const CurrentContext current_;
   const GLibPtr<GSource> tick_;
@@ -78,8 +76,8 @@ private:
   std::string session_;
   bool portalIsGone_ = false;
   bool sessionIsClosed_ = false;
-  std::unique_ptr<Subscription> ownerChanged_;
-  std::unique_ptr<Subscription> closed_;
+  std::unique_ptr<DBusSubscription> ownerChanged_;
+  std::unique_ptr<DBusSubscription> closed_;
   std::uint32_t node_ = 0;
   std::string restoreToken_;
   FileDescriptor remote_;
