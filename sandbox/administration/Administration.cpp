@@ -2,9 +2,14 @@
 
 #include "Commands.h"
 
+#include <cerrno>
+#include <filesystem>
 #include <fstream>
 #include <iostream>
 #include <stdexcept>
+#include <system_error>
+
+#include <unistd.h>
 
 namespace lumora::sandbox {
 
@@ -40,6 +45,17 @@ std::string readPassword(const std::string& path) {
   return firstLine(file);
 }
 
+void becomeProgram(const std::string& name, std::vector<std::string> arguments) {
+  std::string program = std::filesystem::read_symlink("/proc/self/exe").replace_filename(name).string();
+  std::vector<char*> words{program.data()};
+  for (auto& argument : arguments) {
+    words.push_back(argument.data());
+  }
+  words.push_back(nullptr);
+  execv(program.c_str(), words.data());
+  throw std::system_error(errno, std::generic_category(), program);
+}
+
 int administrate(int argc, char** argv) {
   constexpr int wrongUse = 2;
   CLI::App program("A stand-in for a Lumora server: makes one, and tells what was submitted to it.", "lumora-sandbox");
@@ -53,6 +69,7 @@ int administrate(int argc, char** argv) {
   addEpisodesCommand(program);
   addInjectCommand(program);
   addAgentCommand(program);
+  addAnnounceCommand(program);
   try {
     program.parse(argc, argv);
     return 0;

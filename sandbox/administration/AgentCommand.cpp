@@ -1,12 +1,8 @@
 #include "../store/Store.h"
 #include "Commands.h"
 
-#include <cerrno>
 #include <memory>
 #include <stdexcept>
-#include <system_error>
-
-#include <unistd.h>
 
 namespace lumora::sandbox {
 
@@ -22,9 +18,7 @@ void serve(const Options& options) {
   if (!Store::existsAt(options.root)) {
     throw std::runtime_error("there is no server at " + options.root);
   }
-  const auto program = std::filesystem::read_symlink("/proc/self/exe").replace_filename("lumora-sandbox-agent");
-  execl(program.c_str(), program.c_str(), options.root.c_str(), "--authority", options.authority.c_str(), nullptr);
-  throw std::system_error(errno, std::generic_category(), program.string());
+  becomeProgram("lumora-sandbox-agent", {options.root, "--authority", options.authority});
 }
 
 } // namespace

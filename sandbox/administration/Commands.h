@@ -1,6 +1,7 @@
 #pragma once
 
 #include <string>
+#include <vector>
 
 #include <CLI/CLI.hpp>
 
@@ -18,6 +19,7 @@ void addSingleSignOnCommands(CLI::App& program);
 void addEpisodesCommand(CLI::App& program);
 void addInjectCommand(CLI::App& program);
 void addAgentCommand(CLI::App& program);
+void addAnnounceCommand(CLI::App& program);
 
 /// The required first argument of every command.
 void addRootArgument(CLI::App& command, std::string& root);
@@ -25,5 +27,7 @@ void addRootArgument(CLI::App& command, std::string& root);
 void addPasswordOption(CLI::App& command, std::string& path);
 /// The first line of the file ("-": standard input). Passwords are never arguments: others could see them.
 std::string readPassword(const std::string& path);
+/// Goes on as the program of this name that lies beside this one.
+[[noreturn]] void becomeProgram(const std::string& name, std::vector<std::string> arguments);
 
 } // namespace lumora::sandbox

@@ -1,11 +1,9 @@
 #include "Command.h"
 
+#include "../MachineName.h"
 #include "../Status.h"
 
 #include <algorithm>
-#include <array>
-
-#include <unistd.h>
 
 namespace lumora::sandbox {
 
@@ -85,11 +83,6 @@ const std::vector<Command>& actionCommands() {
        submitWorkflow},
   };
   return commands;
-}
-
-std::string machineName() {
-  std::array<char, 256> name{};
-  return gethostname(name.data(), name.size() - 1) == 0 ? name.data() : "";
 }
 
 bool isOwnName(const std::string& host) {

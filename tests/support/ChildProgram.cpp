@@ -51,6 +51,10 @@ void ChildProgram::signal(int number) {
   g_subprocess_send_signal(process_.get(), number);
 }
 
+bool ChildProgram::wait() {
+  return g_subprocess_wait_check(process_.get(), nullptr, nullptr) != FALSE;
+}
+
 void ChildProgram::kill() {
   g_subprocess_force_exit(process_.get());
   g_subprocess_wait(process_.get(), nullptr, nullptr);

@@ -25,6 +25,8 @@ public:
   void writeLine(const std::string& line);
   /// Sends it a signal.
   void signal(int number);
+  /// Waits for its end; true when it ended with status 0.
+  bool wait();
   /// Kills it, and waits for its end.
   void kill();
 
