@@ -44,6 +44,11 @@ std::string configuration(const std::string& host) {
          "publish-workstation=no\n";
 }
 
+fs::path withServices(fs::path folder) {
+  fs::create_directories(folder / "services");
+  return folder;
+}
+
 std::string hexadecimal(const std::string& bytes) {
   constexpr const char* digits = "0123456789abcdef";
   std::string text;
@@ -64,8 +69,7 @@ std::string recordElement(const RecordString& string) {
 } // namespace
 
 AvahiHost::AvahiHost(std::string name, fs::path folder)
-    : name_(std::move(name)), folder_(std::move(folder)), bus_(folder_) {
-  fs::create_directories(folder_ / "services");
+    : name_(std::move(name)), folder_(withServices(std::move(folder))), bus_(folder_) {
   writeFile(folder_ / "avahi.conf", configuration(name_));
 }
 
