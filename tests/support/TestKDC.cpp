@@ -127,6 +127,10 @@ void TestKDC::pointClientsAt(std::uint16_t port) {
   writeFile(folder_ / "krb5.conf", clientConfiguration(realm_, port));
 }
 
+void TestKDC::forgetRealm() {
+  writeFile(folder_ / "krb5.conf", "[libdefaults]\n dns_lookup_realm = false\n");
+}
+
 void TestKDC::administrate(const std::string& query) {
   EXPECT_EQ(run(administrationProgram, {"-r", realm_, "-q", query}), 0) << query;
 }

@@ -50,6 +50,8 @@ public:
 
   /// Has all callers ask at another port of this machine.
   void pointClientsAt(std::uint16_t port);
+  /// All callers are on a machine that is in no realm from now on.
+  void forgetRealm();
 
 private:
   int run(const std::string& program, const std::vector<std::string>& arguments, const std::string& input = {});
