@@ -112,18 +112,29 @@ void Announcement::announceByOtherName() {
   announce();
 }
 
+// Now: a collision is told several times, also of a name that was given up meanwhile.
+gint32 Announcement::state() const {
+  GLibPtr<GError> error;
+  const auto answer = call(group_, groupInterface, "GetState", nullptr, error);
+  gint32 state = 0;
+  if (answer) {
+    g_variant_get_child(answer.get(), 0, "i", &state);
+  }
+  return state;
+}
+
 void Announcement::stateChanged(GDBusConnection* /*bus*/, const gchar* /*sender*/, const gchar* path,
                                 const gchar* /*interface*/, const gchar* /*signal*/, GVariant* parameters,
                                 gpointer self) {
   auto& announcement = *static_cast<Announcement*>(self);
-  gint32 state = 0;
-  g_variant_get_child(parameters, 0, "i", &state);
   if (announcement.group_ != path) {
     return;
   }
+  gint32 state = 0;
+  g_variant_get_child(parameters, 0, "i", &state);
   if (state == established) {
     std::cout << "Announced as \"" << announcement.server_.name << "\"." << std::endl;
-  } else if (state == collided) {
+  } else if (state == collided && announcement.state() == collided) {
     announcement.announceByOtherName();
   }
 }

@@ -36,6 +36,7 @@ private:
   backend::GLibPtr<GVariant> call(const std::string& path, const char* interface, const char* method,
                                   GVariant* parameters, backend::GLibPtr<GError>& error) const;
   std::string textFrom(const char* method, GVariant* parameters) const;
+  gint32 state() const;
   void announce();
   void announceByOtherName();
 

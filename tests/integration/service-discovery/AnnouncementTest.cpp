@@ -39,15 +39,6 @@ TEST_F(AnnouncementTest, takesTheNextName_whenAnotherServerHasIt) {
   EXPECT_EQ(second->readLine(), "Announced as \"Sandbox #2\".");
 }
 
-TEST_F(AnnouncementTest, takesTheNextName_whenAServerOfAnotherHostHasIt) {
-  ASSERT_TRUE(network_.startOtherHost());
-  network_.there().publish("Sandbox");
-  browse();
-  ASSERT_TRUE(find("Sandbox"));
-  const auto announcement = announce({"--name", "Sandbox"});
-  EXPECT_EQ(announcement->readLine(), "Announced as \"Sandbox #2\".");
-}
-
 TEST_F(AnnouncementTest, isMadeAgain_whenTheDaemonIsRestarted) {
   const auto announcement = announce({"--name", "Sandbox"});
   announcement->readLine();
