@@ -1,5 +1,6 @@
 #include "TestAvahi.h"
 
+#include <chrono>
 #include <csignal>
 #include <cstdlib>
 #include <filesystem>
@@ -97,15 +98,21 @@ void AvahiHost::thawDaemon() {
   daemon_->signal(SIGCONT);
 }
 
-// The daemon sees a file that is moved there, never half of one.
+// The daemon sees a file that is moved there, never half of one. It takes a file for unchanged whose time is in the
+// same second.
 void AvahiHost::publish(const std::string& name, std::uint16_t port, const std::vector<RecordString>& record) const {
   std::string text = "<service-group><name>" + name + "</name><service><type>_lumora._tcp</type><port>" +
                      std::to_string(port) + "</port>";
   for (const auto& string : record) {
     text += recordElement(string);
   }
-  writeFile(folder_ / "service", text + "</service></service-group>\n");
-  fs::rename(folder_ / "service", folder_ / "services" / (name + ".service"));
+  const fs::path fresh = folder_ / "service";
+  const fs::path published = folder_ / "services" / (name + ".service");
+  writeFile(fresh, text + "</service></service-group>\n");
+  if (fs::exists(published)) {
+    fs::last_write_time(fresh, fs::last_write_time(published) + std::chrono::seconds(1));
+  }
+  fs::rename(fresh, published);
 }
 
 void AvahiHost::withdraw(const std::string& name) const {
