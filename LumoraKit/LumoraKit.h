@@ -59,6 +59,7 @@
 #include <LumoraKit/recording/LMRCaptureDeviceInputAdditions.h>
 #include <LumoraKit/recording/LMRCaptureSessionAdditions.h>
 #include <LumoraKit/recording/LMRDiskSpaceWatch.h>
+#include <LumoraKit/recording/LMRLevelMeter.h>
 #include <LumoraKit/recording/LMRLocalAudioRecorder.h>
 #include <LumoraKit/recording/LMRLocalScreenRecorder.h>
 #include <LumoraKit/recording/LMRLocalVideoRecorder.h>

@@ -11,6 +11,10 @@ MovieFileOutput::~MovieFileOutput() = default;
 CaptureSession::~CaptureSession() = default;
 MediaCapture::~MediaCapture() = default;
 
+std::vector<SoundLevel> SampleBuffer::soundLevels() const {
+  return {};
+}
+
 void MovieFileOutput::recordToOutputFileURL_atHostTime(const std::filesystem::path& file, HostTime) {
   recordToOutputFileURL(file);
 }

@@ -103,12 +103,24 @@ struct CompressionOptions {
   friend bool operator==(const CompressionOptions&, const CompressionOptions&) = default;
 };
 
+/// How loud one channel of a sound buffer is; 1 is full scale.
+struct SoundLevel {
+  /// The largest magnitude.
+  double peak = 0;
+  /// The root of the mean square.
+  double rms = 0;
+
+  friend bool operator==(const SoundLevel&, const SoundLevel&) = default;
+};
+
 /// A captured sample buffer, valid during the callback that shows it.
 class LUMORA_EXPORT SampleBuffer {
 public:
   virtual ~SampleBuffer();
   /// When it was captured, on the host clock; nothing when the device did not say.
   virtual std::optional<HostTime> hostTime() const = 0;
+  /// One a channel; none for a picture. Reads the whole buffer.
+  virtual std::vector<SoundLevel> soundLevels() const;
 };
 
 class MovieFileOutput;

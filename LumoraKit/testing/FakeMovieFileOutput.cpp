@@ -12,6 +12,11 @@ std::optional<HostTime> FakeSampleBuffer::hostTime() const {
   return hostTime_;
 }
 
+std::vector<SoundLevel> FakeSampleBuffer::soundLevels() const {
+  ++reads_;
+  return soundLevels_;
+}
+
 FakeMovieFileOutput::FakeMovieFileOutput() = default;
 FakeMovieFileOutput::~FakeMovieFileOutput() = default;
 

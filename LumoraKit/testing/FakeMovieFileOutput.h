@@ -14,17 +14,20 @@ namespace lumora::fakes {
 
 class FakeCaptureSession;
 
-/// A sample that holds nothing but its host time.
+/// A sample that holds nothing but its host time, and the levels of its sound when it is given any.
 class LUMORA_EXPORT FakeSampleBuffer : public SampleBuffer {
 public:
-  explicit FakeSampleBuffer(std::optional<HostTime> hostTime) : hostTime_(hostTime) {}
+  explicit FakeSampleBuffer(std::optional<HostTime> hostTime, std::vector<SoundLevel> soundLevels = {})
+      : hostTime_(hostTime), soundLevels_(std::move(soundLevels)) {}
 
   std::optional<HostTime> hostTime() const override;
-  /// How often the host time was read.
+  std::vector<SoundLevel> soundLevels() const override;
+  /// How often something of it was read.
   int reads() const { return reads_; }
 
 private:
   const std::optional<HostTime> hostTime_;
+  const std::vector<SoundLevel> soundLevels_;
   mutable std::atomic<int> reads_ = 0;
 };
 

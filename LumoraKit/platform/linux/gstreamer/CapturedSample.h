@@ -12,6 +12,7 @@ public:
   CapturedSample(GstSample& sample, HostTime time) : sample_(sample), time_(time) {}
 
   std::optional<HostTime> hostTime() const override { return time_; }
+  std::vector<SoundLevel> soundLevels() const override;
 
   HostTime time() const { return time_; }
   GstSample& sample() const { return sample_; }
