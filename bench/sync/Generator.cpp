@@ -92,8 +92,11 @@ private:
 void runScreen() {
   GstAppSrc* const source = start("appsrc name=source is-live=true format=time caps=video/x-raw,format=GRAY8,width=256,"
                                   "height=192,framerate=0/1 ! videoconvert ! ximagesink sync=false");
+  if (!source) {
+    return;
+  }
   double shown = -1;
-  for (HostTime time = now(); source; time += 4'000'000) {
+  for (HostTime time = now();; time += 4'000'000) {
     sleepUntil(time);
     const double level = light::level(now());
     if (level != shown) {
