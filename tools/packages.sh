@@ -25,6 +25,8 @@ demo_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
 test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg polkitd xdg-desktop-portal man-db mandoc zsh krb5-kdc krb5-admin-server krb5-user
   gnome-keyring avahi-daemon iproute2)
 bench_packages=(libbenchmark-dev libpipewire-0.3-dev gstreamer1.0-tools bsdextrautils dbus gnome-keyring)
+# The pictures of the login panel: an optimiser, and the letters that they show.
+picture_packages=(optipng fonts-dejavu-core fonts-ipaexfont-gothic)
 check_packages=(clang-format-14 git python3)
 lint_packages=(clang-14 clang-tidy-14 libclang-rt-14-dev python3)
 

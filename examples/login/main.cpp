@@ -6,7 +6,7 @@
 #include <iostream>
 
 struct Recorder {
-  void loginEnded(int returnCode) {
+  void loginEnded(int returnCode) const {
     if (returnCode == LMRServerLoginSheetController::LoggedIn) {
       const auto session = sheet.serverLoginViewController()->loginSession();
       std::cout << session->description() << ", " << session->userFullName().value_or("") << '\n';

@@ -3,7 +3,6 @@
 #include <QFontMetricsF>
 #include <QPainter>
 #include <QPalette>
-#include <QStyle>
 #include <QTextLayout>
 #include <QTextOption>
 
@@ -54,8 +53,10 @@ void ElidedLabel::paintEvent(QPaintEvent* /*event*/) {
   painter.setPen(palette().color(foregroundRole()));
   const double lineHeight = QFontMetricsF(font()).lineSpacing();
   double top = (height() - lineHeight * static_cast<double>(shown.size())) / 2;
-  const int flags = static_cast<int>(QStyle::visualAlignment(layoutDirection(), Qt::AlignLeft | Qt::AlignVCenter)) |
-                    Qt::TextSingleLine;
+  // The text keeps its own direction: a sentence ends at its end, on whichever side the label stands.
+  painter.setLayoutDirection(text().isRightToLeft() ? Qt::RightToLeft : Qt::LeftToRight);
+  const auto side = layoutDirection() == Qt::RightToLeft ? Qt::AlignRight : Qt::AlignLeft;
+  const int flags = static_cast<int>(side | Qt::AlignVCenter | Qt::AlignAbsolute) | Qt::TextSingleLine;
   for (const QString& line : shown) {
     painter.drawText(QRectF(0, top, width(), lineHeight), flags, line);
     top += lineHeight;

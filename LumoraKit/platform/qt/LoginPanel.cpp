@@ -60,6 +60,7 @@ LoginPanel::LoginPanel(const std::shared_ptr<LMRServerLoginViewController>& owne
   bindPassword();
   bindRememberPassword();
   describe();
+  alignLabels();
 }
 
 LoginPanel::~LoginPanel() = default;
@@ -166,17 +167,27 @@ void LoginPanel::reportUserName(const std::shared_ptr<TextField>& field) {
           });
 }
 
+std::array<QLabel*, 3> LoginPanel::labels() const {
+  return {ui_->serverLabelTextField, ui_->userNameLabelTextField, ui_->passwordLabelTextField};
+}
+
+// Beside their fields, also where the panel is mirrored and their texts are not.
+void LoginPanel::alignLabels() {
+  const auto side = layoutDirection() == Qt::RightToLeft ? Qt::AlignLeft : Qt::AlignRight;
+  for (QLabel* const label : labels()) {
+    label->setAlignment(side | Qt::AlignVCenter | Qt::AlignAbsolute);
+  }
+}
+
 // A language with long labels gets a wider column of them; the fields give way.
 
 void LoginPanel::fitLabelColumn() {
-  const std::array<QLabel*, 3> labels{ui_->serverLabelTextField, ui_->userNameLabelTextField,
-                                      ui_->passwordLabelTextField};
   DesignLayout& layout = *DesignLayout::of(this);
   double width = narrowestLabels;
-  for (const QLabel* const label : labels) {
+  for (const QLabel* const label : labels()) {
     width = std::max(width, neededBy(*label) + 2);
   }
-  for (const QLabel* const label : labels) {
+  for (const QLabel* const label : labels()) {
     placeHorizontally(layout, label, margin, margin + width);
   }
   const double left = margin + width + gap;
@@ -202,6 +213,8 @@ void LoginPanel::changeEvent(QEvent* event) {
     describe();
   } else if (event->type() == QEvent::FontChange || event->type() == QEvent::StyleChange) {
     fitLabelColumn();
+  } else if (event->type() == QEvent::LayoutDirectionChange) {
+    alignLabels();
   }
 }
 

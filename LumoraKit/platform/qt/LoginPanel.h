@@ -6,11 +6,12 @@
 
 #include <QString>
 #include <QWidget>
+#include <array>
 #include <memory>
 #include <vector>
 
 class QEvent;
-class QLineEdit;
+class QLabel;
 
 namespace Ui {
 class ServerLoginView;
@@ -42,6 +43,8 @@ private:
   void bindRememberPassword();
   void report(const std::shared_ptr<KTServiceComboBox>& comboBox);
   void reportUserName(const std::shared_ptr<TextField>& field);
+  std::array<QLabel*, 3> labels() const;
+  void alignLabels();
   void fitLabelColumn();
 
   const std::weak_ptr<LMRServerLoginViewController> owner_;

@@ -1,5 +1,6 @@
 #include "ui_ServerLoginWindow.h"
 
+#include <LumoraKit/platform/MainThread.h>
 #include <LumoraKit/platform/NotificationCenter.h>
 #include <LumoraKit/platform/Platform.h>
 #include <LumoraKit/platform/qt/DesignLayout.h>
@@ -60,7 +61,6 @@ LoginWindow::LoginWindow(const std::shared_ptr<LMRServerLoginSheetController>& o
   for (QWidget* const host : {static_cast<QWidget*>(this), ui_->progressPage, ui_->errorPage}) {
     new DesignLayout(host); // the host owns it
   }
-  contentHeight_ = height();
   ui_->serverLoginView->installEventFilter(this);
   ui_->errorTextField->installEventFilter(this);
   growth_.setDuration(growthInMilliseconds);
@@ -69,7 +69,8 @@ LoginWindow::LoginWindow(const std::shared_ptr<LMRServerLoginSheetController>& o
           [this](const QVariant& value) { setHeight(value.toInt()); });
   bindButtons();
   bindPages();
-  fit();
+  fitWidth();
+  setContentHeight(height(), false);
 }
 
 LoginWindow::~LoginWindow() = default;
@@ -259,8 +260,11 @@ bool LoginWindow::eventFilter(QObject* watched, QEvent* event) {
   } else if (type == QEvent::Move || type == QEvent::Resize) {
     hangFromParent();
   } else if (type == QEvent::WindowActivate || type == QEvent::FocusIn) {
-    QMetaObject::invokeMethod(
-        this, [this] { takeKeyboardBack(); }, Qt::QueuedConnection);
+    Platform::current().mainThread->post([window = QPointer(this)] {
+      if (window) {
+        window->takeKeyboardBack();
+      }
+    });
   }
   return false;
 }

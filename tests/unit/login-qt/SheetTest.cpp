@@ -91,6 +91,8 @@ TEST_F(SheetQtTest, parent_getsNoClicks_whileTheSheetIsShown) {
 TEST_F(SheetQtTest, sheet_takesTheKeyboardBack_whenItsParentGetsIt) {
   begin();
   parent_->activateWindow();
+  EXPECT_TRUE(QTest::qWaitFor([&] { return QGuiApplication::focusWindow() == parent_->windowHandle(); }));
+  run();
   EXPECT_TRUE(waitForKeyboard());
   EXPECT_EQ(focus(), "serverComboBox");
 }

@@ -1,0 +1,69 @@
+#include "Pictures.h"
+
+#include <QApplication>
+#include <QCommandLineParser>
+#include <QFontInfo>
+#include <QPalette>
+#include <QProxyStyle>
+#include <cstdlib>
+#include <iostream>
+
+// Draws the login panel in each of its states, for the pages in docs/. Nothing is shown on a screen.
+
+namespace {
+
+QPalette darkPalette() {
+  QPalette palette(QColor(0x45, 0x45, 0x45), QColor(0x38, 0x38, 0x38));
+  palette.setColor(QPalette::Base, QColor(0x1c, 0x1c, 0x1c));
+  palette.setColor(QPalette::Highlight, QColor(0x3d, 0x7e, 0xc9));
+  return palette;
+}
+
+// Nothing moves, so that every picture is of an end.
+class StillStyle final : public QProxyStyle {
+public:
+  StillStyle() : QProxyStyle("fusion") {}
+
+  int styleHint(StyleHint hint, const QStyleOption* option, const QWidget* widget,
+                QStyleHintReturn* data) const override {
+    return hint == SH_Widget_Animation_Duration ? 0 : QProxyStyle::styleHint(hint, option, widget, data);
+  }
+};
+
+} // namespace
+
+int main(int argc, char** argv) {
+  ::setenv("QT_QPA_PLATFORM", "offscreen", 1);
+  const QApplication application(argc, argv);
+  QApplication::setStyle(new StillStyle); // the application owns it
+  QCommandLineParser parser;
+  parser.setApplicationDescription("Draws the login panel in each of its states.");
+  parser.addHelpOption();
+  parser.addPositionalArgument("folder", "where the pictures go");
+  parser.addOptions({{"name", "begins the name of each picture", "name", "light"},
+                     {"dark", "a dark palette"},
+                     {"large", "a font of twice the size"},
+                     {"language", "the user's language", "tag", "en"},
+                     {"right-to-left", "mirrored"},
+                     {"states", "only these, separated by commas", "names"}});
+  parser.process(application);
+  if (parser.positionalArguments().size() != 1) {
+    parser.showHelp(EXIT_FAILURE);
+  }
+
+  if (parser.isSet("dark")) {
+    QApplication::setPalette(darkPalette());
+  }
+  QFont font("DejaVu Sans");
+  font.setPixelSize(parser.isSet("large") ? 24 : 12);
+  QApplication::setFont(font);
+  QApplication::setCursorFlashTime(0); // the cursor is always seen
+  if (parser.isSet("right-to-left")) {
+    QApplication::setLayoutDirection(Qt::RightToLeft);
+  }
+  pictures::Pictures all({.folder = parser.positionalArguments().front(),
+                          .name = parser.value("name"),
+                          .language = parser.value("language").toStdString(),
+                          .states = parser.value("states").split(',', Qt::SkipEmptyParts)});
+  return all.draw() ? EXIT_SUCCESS : EXIT_FAILURE;
+}
