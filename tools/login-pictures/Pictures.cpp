@@ -12,6 +12,7 @@
 #include <QPainter>
 #include <QPushButton>
 #include <QTest>
+#include <algorithm>
 #include <iostream>
 #include <utility>
 #include <vector>
@@ -57,12 +58,10 @@ bool Pictures::draw() {
       {"dialog", &Pictures::dialog},
       {"over-a-window", &Pictures::overAWindow},
   };
-  for (const auto& [name, state] : states) {
-    if ((order_.states.isEmpty() || order_.states.contains(name)) && !draw(name, state)) {
-      return false;
-    }
-  }
-  return true;
+  return std::ranges::all_of(states, [this](const auto& state) {
+    const bool isWanted = order_.states.isEmpty() || order_.states.contains(state.first);
+    return !isWanted || draw(state.first, state.second);
+  });
 }
 
 bool Pictures::draw(const char* name, State state) {

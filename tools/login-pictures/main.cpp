@@ -7,6 +7,7 @@
 #include <QProxyStyle>
 #include <cstdlib>
 #include <iostream>
+#include <memory>
 
 // Draws the login panel in each of its states, for the pages in docs/. Nothing is shown on a screen.
 
@@ -35,7 +36,7 @@ public:
 int main(int argc, char** argv) {
   ::setenv("QT_QPA_PLATFORM", "offscreen", 1);
   const QApplication application(argc, argv);
-  QApplication::setStyle(new StillStyle); // the application owns it
+  QApplication::setStyle(std::make_unique<StillStyle>().release()); // the application owns it
   QCommandLineParser parser;
   parser.setApplicationDescription("Draws the login panel in each of its states.");
   parser.addHelpOption();
