@@ -10,7 +10,7 @@ build_packages=(
 )
 
 # The library itself brings what it links (libsecret-1-0, libsodium23, ...); passwords are kept where the desktop has a
-# Secret Service, such as gnome-keyring.
+# Secret Service, such as gnome-keyring, and servers are found where there is an avahi-daemon.
 #
 # GStreamer's elements: capture (PipeWire, PulseAudio, X11), encoders and muxers.
 run_packages=(

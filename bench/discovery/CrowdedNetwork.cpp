@@ -31,11 +31,11 @@ CrowdedNetwork::CrowdedNetwork(const std::string& address)
           address.c_str(),
           static_cast<GDBusConnectionFlags>(G_DBUS_CONNECTION_FLAGS_AUTHENTICATION_CLIENT |
                                             G_DBUS_CONNECTION_FLAGS_MESSAGE_BUS_CONNECTION),
-          nullptr, nullptr, nullptr)) {
+          nullptr, nullptr, nullptr)),
+      name_(g_bus_own_name_on_connection(bus_.get(), daemonName, G_BUS_NAME_OWNER_FLAGS_NONE, nullptr, nullptr, nullptr,
+                                         nullptr)) {
   serve("/");
   serve(browserPath);
-  name_ = g_bus_own_name_on_connection(bus_.get(), daemonName, G_BUS_NAME_OWNER_FLAGS_NONE, nullptr, nullptr, nullptr,
-                                       nullptr);
 }
 
 CrowdedNetwork::~CrowdedNetwork() {

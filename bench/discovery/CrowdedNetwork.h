@@ -30,8 +30,8 @@ private:
   void serve(const char* path);
   void tellOf(const char* signal, int count) const;
 
-  backend::GLibPtr<GDBusConnection> bus_;
-  guint name_ = 0;
+  const backend::GLibPtr<GDBusConnection> bus_;
+  const guint name_;
   int searches_ = 0;
 };
 

@@ -37,9 +37,9 @@ struct Typist : KTServiceComboBoxDelegate {
 /// A combo box in which a letter is typed whenever its list has changed.
 struct Panel {
   explicit Panel(const Platform& machine) {
-    auto platform = Platform::current();
-    platform.serviceDiscovery = machine.serviceDiscovery;
-    Platform::install(platform);
+    auto own = Platform::current();
+    own.serviceDiscovery = machine.serviceDiscovery;
+    Platform::install(own);
   }
 
   bool waitUntilListed(std::size_t count) {

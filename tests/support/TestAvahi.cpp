@@ -120,7 +120,7 @@ void AvahiHost::withdraw(const std::string& name) const {
 }
 
 std::optional<std::string> TestAvahi::obstacle() {
-  if (const auto noBus = TestBus::obstacle()) {
+  if (auto noBus = TestBus::obstacle()) {
     return noBus;
   }
   for (const char* const program : {daemonProgram, "/usr/sbin/ip"}) {

@@ -153,7 +153,7 @@ void AvahiDaemon::went(const std::string& reason) {
   }
 }
 
-void AvahiDaemon::add(std::shared_ptr<Dependent> dependent) {
+void AvahiDaemon::add(const std::shared_ptr<Dependent>& dependent) {
   dependents_.push_back(dependent);
   if (!owner_.empty()) {
     dependent->daemonCame();

@@ -45,7 +45,7 @@ public:
   void end();
 
   /// Tells it at once how things are, unless that is not known yet, and then of every change.
-  void add(std::shared_ptr<Dependent> dependent);
+  void add(const std::shared_ptr<Dependent>& dependent);
   void remove(const Dependent& dependent);
 
   /// Calls a method of the daemon's. There is no answer when the daemon goes before it came: dependents are told that.

@@ -7,7 +7,10 @@
 #include <LumoraKit/platform/linux/avahi/ServiceSearch.h>
 #include <LumoraKit/platform/linux/avahi/SystemBusProbe.h>
 
+#include <functional>
 #include <map>
+#include <memory>
+#include <string>
 #include <utility>
 
 // The daemon is reached over the system bus from a thread of our own, so that nothing waits for bus or daemon and the
@@ -35,7 +38,9 @@ private:
   };
   using Change = void (Listing::*)(const ServiceInstance& instance);
 
-  std::function<void(const ServiceInstance& instance)> posting(Change change) const;
+  static std::function<void(const ServiceInstance& instance)> posting(const std::shared_ptr<Listing>& listing,
+                                                                      Change change);
+  static std::shared_ptr<ServiceSearch> searchFor(std::string type, const std::shared_ptr<Listing>& listing);
 
   const std::shared_ptr<Listing> listing_;
   const std::shared_ptr<ServiceSearch> search_;
@@ -43,8 +48,7 @@ private:
 
 AvahiBrowser::AvahiBrowser(std::shared_ptr<AvahiLink> link, std::string type, ServiceBrowserEvents events)
     : listing_(std::make_shared<Listing>(Listing{std::move(link), std::move(events), {}})),
-      search_(std::make_shared<ServiceSearch>(
-          std::move(type), ServiceSearch::Events{posting(&Listing::found), posting(&Listing::lost)})) {
+      search_(searchFor(std::move(type), listing_)) {
   listing_->link->post([search = search_](AvahiDaemon& daemon) { search->start(daemon); });
 }
 
@@ -52,14 +56,22 @@ AvahiBrowser::~AvahiBrowser() {
   listing_->link->post([search = search_](AvahiDaemon&) { search->stop(); });
 }
 
-std::function<void(const ServiceInstance& instance)> AvahiBrowser::posting(Change change) const {
-  return [weak = std::weak_ptr(listing_), change](const ServiceInstance& instance) {
+std::function<void(const ServiceInstance& instance)> AvahiBrowser::posting(const std::shared_ptr<Listing>& listing,
+                                                                           Change change) {
+  return [weak = std::weak_ptr(listing), change](const ServiceInstance& instance) {
     Platform::current().mainThread->post([weak, change, instance] {
-      if (const auto listing = weak.lock()) {
-        ((*listing).*change)(instance);
+      if (const auto living = weak.lock()) {
+        ((*living).*change)(instance);
       }
     });
   };
+}
+
+std::shared_ptr<ServiceSearch> AvahiBrowser::searchFor(std::string type, const std::shared_ptr<Listing>& listing) {
+  ServiceSearch::Events events;
+  events.found = posting(listing, &Listing::found);
+  events.lost = posting(listing, &Listing::lost);
+  return std::make_shared<ServiceSearch>(std::move(type), std::move(events));
 }
 
 void AvahiBrowser::Listing::found(const ServiceInstance& instance) {

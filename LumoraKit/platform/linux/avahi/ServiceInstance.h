@@ -2,8 +2,9 @@
 
 #include <LumoraKit/platform/LMRError.h>
 
-#include <compare>
 #include <string>
+#include <tuple>
+#include <utility>
 
 namespace lumora::backend {
 
@@ -13,7 +14,10 @@ struct ServiceInstance {
   std::string type;
   std::string domain;
 
-  auto operator<=>(const ServiceInstance&) const = default;
+  bool operator==(const ServiceInstance&) const = default;
+  bool operator<(const ServiceInstance& other) const {
+    return std::tie(name, type, domain) < std::tie(other.name, other.type, other.domain);
+  }
 };
 
 enum class DiscoveryErrorCode { NotAvailable = -1, TimedOut = -2, Refused = -3 };

@@ -31,8 +31,8 @@ public:
 
 private:
   void follow(const std::string& path);
-  void added(GVariant& item);
-  void removed(GVariant& item);
+  void added(GVariant& arguments);
+  void removed(GVariant& arguments);
   void failed(const std::string& reason);
   void loseAll();
 

@@ -3,9 +3,9 @@
 #include <LumoraKit/platform/Export.h>
 #include <LumoraKit/platform/linux/avahi/ServiceInstance.h>
 
-#include <compare>
 #include <map>
 #include <set>
+#include <tuple>
 #include <vector>
 
 namespace lumora::backend {
@@ -17,7 +17,9 @@ public:
     int interface = 0;
     int protocol = 0;
 
-    auto operator<=>(const Place&) const = default;
+    bool operator<(const Place& other) const {
+      return std::tie(interface, protocol) < std::tie(other.interface, other.protocol);
+    }
   };
 
   /// True when it was seen nowhere before.
