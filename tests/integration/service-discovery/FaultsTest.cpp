@@ -100,7 +100,7 @@ TEST_F(DaemonFaultsTest, threadsAndDescriptors_areGivenBack) {
 class BusFaultsTest : public testing::Test {
 protected:
   BusFaultsTest() { setBus("unix:path=" + (folder_ / "bus").string()); }
-  ~BusFaultsTest() override { ::unsetenv("DBUS_SYSTEM_BUS_ADDRESS"); }
+  void TearDown() override { ::unsetenv("DBUS_SYSTEM_BUS_ADDRESS"); }
 
   static void setBus(const std::string& address) { ::setenv("DBUS_SYSTEM_BUS_ADDRESS", address.c_str(), 1); }
   std::unique_ptr<lumora::ServiceBrowser> browse() {

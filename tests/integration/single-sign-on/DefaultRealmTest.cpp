@@ -22,7 +22,7 @@ namespace {
 class DefaultRealmTest : public testing::Test {
 protected:
   DefaultRealmTest() { ::setenv("KRB5_CONFIG", file().c_str(), 1); }
-  ~DefaultRealmTest() override { ::unsetenv("KRB5_CONFIG"); }
+  void TearDown() override { ::unsetenv("KRB5_CONFIG"); }
 
   std::string file() const { return folder_ / "krb5.conf"; }
   void configure(const std::string& text) const { lumora::tests::writeFile(file(), text); }
