@@ -22,7 +22,7 @@ run_packages=(
 headless_packages=(dbus pipewire pipewire-bin pipewire-pulse wireplumber libspa-0.2-modules xvfb)
 
 demo_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
-test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg polkitd xdg-desktop-portal man-db mandoc zsh krb5-kdc krb5-admin-server krb5-user
+test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg polkitd xdg-desktop-portal man-db mandoc zsh krb5-kdc krb5-admin-server krb5-user jwm
   gnome-keyring avahi-daemon iproute2)
 bench_packages=(libbenchmark-dev libpipewire-0.3-dev gstreamer1.0-tools bsdextrautils dbus gnome-keyring)
 # The pictures of the login panel: an optimiser, and the letters that they show.

@@ -6,8 +6,6 @@
 #include <QPalette>
 #include <QProxyStyle>
 #include <cstdlib>
-#include <iostream>
-#include <memory>
 
 // Draws the login panel in each of its states, for the pages in docs/. Nothing is shown on a screen.
 
@@ -23,7 +21,7 @@ QPalette darkPalette() {
 // Nothing moves, so that every picture is of an end.
 class StillStyle final : public QProxyStyle {
 public:
-  StillStyle() : QProxyStyle("fusion") {}
+  explicit StillStyle(QObject* owner) : QProxyStyle("fusion") { setParent(owner); }
 
   int styleHint(StyleHint hint, const QStyleOption* option, const QWidget* widget,
                 QStyleHintReturn* data) const override {
@@ -35,8 +33,8 @@ public:
 
 int main(int argc, char** argv) {
   ::setenv("QT_QPA_PLATFORM", "offscreen", 1);
-  const QApplication application(argc, argv);
-  QApplication::setStyle(std::make_unique<StillStyle>().release()); // the application owns it
+  QApplication application(argc, argv);
+  QApplication::setStyle(new StillStyle(&application));
   QCommandLineParser parser;
   parser.setApplicationDescription("Draws the login panel in each of its states.");
   parser.addHelpOption();

@@ -1,4 +1,4 @@
-#include "LoginQtTest.h"
+#include "support/LoginQtTest.h"
 
 #include <QWindow>
 #include <array>

@@ -1,4 +1,4 @@
-#include "LoginQtTest.h"
+#include "support/LoginQtTest.h"
 
 #include <QWheelEvent>
 
@@ -10,7 +10,8 @@ namespace {
 
 class ServerFieldTest : public LoginQtTest {
 protected:
-  ServerFieldTest() {
+  void SetUp() override {
+    LoginQtTest::SetUp();
     begin();
     run();
   }

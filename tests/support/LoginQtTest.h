@@ -38,15 +38,16 @@ struct SheetDelegate {
 /// The login sheet as widgets over a window, on fakes, and queues that run when the test says so.
 class LoginQtTest : public LoginTest {
 protected:
-  LoginQtTest() {
+  void SetUp() override {
     auto platform = Platform::current();
     platform.userInterface = qt::makeUserInterface();
     Platform::install(platform);
+    parent_ = std::make_unique<QMainWindow>();
     parent_->resize(640, 420);
     parent_->show();
     EXPECT_TRUE(QTest::qWaitForWindowExposed(parent_.get()));
   }
-  ~LoginQtTest() override {
+  void TearDown() override {
     sheet_.reset();
     parent_.reset();
     deleteNow();
@@ -116,7 +117,7 @@ protected:
     QTest::keyClicks(&passwordField(), "sesame");
   }
 
-  std::unique_ptr<QMainWindow> parent_ = std::make_unique<QMainWindow>();
+  std::unique_ptr<QMainWindow> parent_;
   std::shared_ptr<SheetDelegate> delegate_ = std::make_shared<SheetDelegate>();
   std::shared_ptr<LMRServerLoginSheetController> sheet_ = std::make_shared<LMRServerLoginSheetController>();
   QPointer<QDialog> dialog_;
