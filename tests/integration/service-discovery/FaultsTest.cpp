@@ -1,6 +1,9 @@
 #include "DiscoveryTest.h"
 #include "support/Descriptors.h"
+#include "support/Sandbox.h"
 #include "support/SilentSocket.h"
+
+#include <glib.h>
 
 #include <cstdlib>
 
@@ -10,6 +13,11 @@ using testing::HasSubstr;
 using testing::IsEmpty;
 
 namespace {
+
+// GLib keeps threads that it may need again for 15 seconds.
+void keepNoUnusedThreads() {
+  g_thread_pool_set_max_unused_threads(0);
+}
 
 class DaemonFaultsTest : public lumora::tests::DiscoveryTest {
 protected:
@@ -75,6 +83,7 @@ TEST_F(DaemonFaultsTest, services_areLostAndFoundAgain_whenTheBusIsRestarted) {
 }
 
 TEST_F(DaemonFaultsTest, threadsAndDescriptors_areGivenBack) {
+  keepNoUnusedThreads();
   network_.here().publish("Studio");
   ASSERT_TRUE(network_.here().startDaemon());
   const auto searchOnce = [&] {
@@ -137,6 +146,7 @@ TEST_F(BusFaultsTest, search_isRefused_whenItsTypeIsNoText) {
 }
 
 TEST_F(BusFaultsTest, search_beginsAndEndsAtOnce_whenTheBusNeverAnswers) {
+  keepNoUnusedThreads();
   const lumora::tests::SilentSocket bus(folder_ / "bus");
   ASSERT_TRUE(browse());
   const auto threads = lumora::tests::threadCount();
@@ -159,6 +169,13 @@ TEST_F(BusFaultsTest, search_findsNothing_whenTheBusHasNoDaemon) {
   const auto browser = browse();
   EXPECT_TRUE(browser);
   EXPECT_FALSE(error_);
+}
+
+TEST_F(BusFaultsTest, announcement_failsWithTheReason_whenThereIsNoBus) {
+  const lumora::tests::SandboxServer server;
+  const auto run = server.administrate({"announce"});
+  EXPECT_EQ(run.status, 1);
+  EXPECT_THAT(run.standardError, HasSubstr("lumora-sandbox-announce: the system bus cannot be reached: "));
 }
 
 } // namespace
