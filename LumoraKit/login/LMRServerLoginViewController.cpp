@@ -88,7 +88,7 @@ void LMRServerLoginViewController::fillInSavedConnection() {
   const auto saved = defaults.objectForKey(LMRSavedConnectionKey);
   const lumora::Dictionary* const record = saved ? saved->dictionary() : nullptr;
   const auto server = record ? record->string(LMRSavedConnectionServerKey) : std::nullopt;
-  if (isEmpty(server) || !outlets_.serverComboBox) {
+  if (!record || isEmpty(server) || !outlets_.serverComboBox) {
     return;
   }
   const lumora::Value* const number = record->find(LMRSavedConnectionPortKey);
@@ -164,7 +164,7 @@ void LMRServerLoginViewController::stopBrowsingForServers() {
   }
 }
 
-void LMRServerLoginViewController::populateDefaultServerChoice() {
+void LMRServerLoginViewController::populateDefaultServerChoice() const {
   makeFirstResponder(outlets_.serverComboBox);
 }
 

@@ -69,7 +69,7 @@ public:
   }
   void stopBrowsingForServers();
   /// Gives the keyboard to the server field.
-  void populateDefaultServerChoice();
+  void populateDefaultServerChoice() const;
   void clearLoginSession() { setLoginSession(nullptr); }
 
   /// The width of the view, and the height that its visible controls need: 26.0 without the password controls, 80.0
