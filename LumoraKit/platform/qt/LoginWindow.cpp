@@ -66,7 +66,7 @@ LoginWindow::LoginWindow(const std::shared_ptr<LMRServerLoginSheetController>& o
   growth_.setDuration(growthInMilliseconds);
   growth_.setEasingCurve(QEasingCurve::OutCubic);
   connect(&growth_, &QVariantAnimation::valueChanged, this,
-          [this](const QVariant& value) { setHeight(value.toInt()); });
+          [this](const QVariant& value) { setFixedHeight(value.toInt()); });
   bindButtons();
   bindPages();
   fitWidth();
@@ -151,22 +151,24 @@ void LoginWindow::fitWidth() {
   hangFromParent();
 }
 
-void LoginWindow::setHeight(int height) {
-  setFixedHeight(height);
-}
-
 void LoginWindow::setContentHeight(double height, bool animate) {
   contentHeight_ = height;
   growth_.stop();
   const int pixels = qRound(height * DesignLayout::unitOf(this));
   const bool isStill = style()->styleHint(QStyle::SH_Widget_Animation_Duration, nullptr, this) == 0;
   if (!animate || isStill || !isVisible()) {
-    setHeight(pixels);
+    setFixedHeight(pixels);
     return;
   }
   growth_.setStartValue(this->height());
   growth_.setEndValue(pixels);
   growth_.start();
+}
+
+// The controller places the error's text only.
+void LoginWindow::fitProgressText() {
+  const QRectF frame = DesignLayout::of(ui_->errorPage)->frame(ui_->errorTextField);
+  DesignLayout::of(ui_->progressPage)->setFrame(ui_->progressTextField, frame);
 }
 
 void LoginWindow::fit() {
@@ -195,13 +197,14 @@ void LoginWindow::changeEvent(QEvent* event) {
 
 void LoginWindow::present(QWidget* parentWidget, QWindow* parentWindow) {
   const bool hasParent = parentWidget || parentWindow;
+  stopFollowing();
   isHanging_ = hasParent && windowsPlaceThemselves();
   parentWindow_ = parentWidget ? nullptr : parentWindow;
   setParent(parentWidget ? parentWidget->window() : nullptr,
             isHanging_ ? Qt::Sheet | Qt::FramelessWindowHint : Qt::Dialog);
   setWindowModality(hasParent ? Qt::WindowModal : Qt::NonModal);
-  if (QObject* const parent = parentWindow_ ? static_cast<QObject*>(parentWindow_) : this->parentWidget()) {
-    parent->installEventFilter(this);
+  if (hasParent) {
+    followed()->installEventFilter(this);
   }
   if (parentWindow_) {
     winId(); // makes the handle
@@ -218,10 +221,19 @@ void LoginWindow::present(QWidget* parentWidget, QWindow* parentWindow) {
 
 void LoginWindow::end() {
   growth_.stop();
-  if (QObject* const parent = parentWindow_ ? static_cast<QObject*>(parentWindow_) : parentWidget()) {
+  stopFollowing();
+  hide();
+}
+
+// The parent, whose moves are followed.
+QObject* LoginWindow::followed() const {
+  return parentWindow_ ? static_cast<QObject*>(parentWindow_) : parentWidget();
+}
+
+void LoginWindow::stopFollowing() {
+  if (QObject* const parent = followed()) {
     parent->removeEventFilter(this);
   }
-  hide();
 }
 
 QRect LoginWindow::geometryOfParent() const {
@@ -249,13 +261,13 @@ void LoginWindow::takeKeyboardBack() {
 
 bool LoginWindow::eventFilter(QObject* watched, QEvent* event) {
   const auto type = event->type();
-  if (watched == ui_->serverLoginView || watched == ui_->errorTextField) {
+  if (watched == ui_->serverLoginView) {
     if (type == QEvent::Resize && panel_) {
       panel_->setGeometry(ui_->serverLoginView->rect());
     }
+  } else if (watched == ui_->errorTextField) {
     if (type == QEvent::Resize) {
-      DesignLayout::of(ui_->progressPage)
-          ->setFrame(ui_->progressTextField, DesignLayout::of(ui_->errorPage)->frame(ui_->errorTextField));
+      fitProgressText();
     }
   } else if (type == QEvent::Move || type == QEvent::Resize) {
     hangFromParent();

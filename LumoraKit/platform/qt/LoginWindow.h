@@ -55,8 +55,10 @@ private:
   void showTexts();
   void adopt(QWidget* panel);
   void fitWidth();
+  void fitProgressText();
   void fit();
-  void setHeight(int height);
+  QObject* followed() const;
+  void stopFollowing();
   QRect geometryOfParent() const;
   void hangFromParent();
   void takeKeyboardBack();
