@@ -11,7 +11,7 @@ constexpr double bitsPerPixelAndSecond = 4'000'000.0 / (1280 * 720);
 constexpr std::uint32_t leastVideoBitRate = 500'000;
 
 // 48 kHz, two channels of 16 bits.
-constexpr std::uint64_t pcmBitRate = 48'000 * 2 * 16;
+constexpr std::uint64_t pcmBitRate = std::uint64_t{48'000} * 2 * 16;
 // Two bits a pixel, 30 pictures a second: JPEG of a restless picture.
 constexpr std::uint64_t jpegBitsPerPixelAndSecond = 60;
 

@@ -13,9 +13,8 @@ constexpr double fullScale = 32768;
 // A buffer that is readable for as long as this lives.
 class MappedBuffer {
 public:
-  explicit MappedBuffer(GstBuffer* buffer) : buffer_(buffer) {
-    isMapped_ = buffer_ && gst_buffer_map(buffer_, &map_, GST_MAP_READ) != FALSE;
-  }
+  explicit MappedBuffer(GstBuffer* buffer)
+      : buffer_(buffer), isMapped_(buffer_ && gst_buffer_map(buffer_, &map_, GST_MAP_READ) != FALSE) {}
   MappedBuffer(const MappedBuffer&) = delete;
   MappedBuffer& operator=(const MappedBuffer&) = delete;
   ~MappedBuffer() {
@@ -30,7 +29,7 @@ public:
 private:
   GstBuffer* buffer_;
   GstMapInfo map_ = GST_MAP_INFO_INIT;
-  bool isMapped_ = false;
+  bool isMapped_;
 };
 
 SoundLevel levelOfChannel(const MappedBuffer& buffer, std::size_t channel, std::size_t channels) {
@@ -41,8 +40,8 @@ SoundLevel levelOfChannel(const MappedBuffer& buffer, std::size_t channel, std::
     peak = std::max(peak, std::abs(value));
     squares += value * value;
   }
-  const auto frames = static_cast<double>(buffer.count() / channels);
-  return {peak, frames > 0 ? std::sqrt(squares / frames) : 0};
+  const std::size_t frames = buffer.count() / channels;
+  return {peak, frames > 0 ? std::sqrt(squares / static_cast<double>(frames)) : 0};
 }
 
 } // namespace

@@ -217,7 +217,7 @@ void DevicePipeline::threadChanged(GstMessage& message) {
 
 XServerLoss::Observer DevicePipeline::serverLost() {
   return [weak = weak_from_this()] {
-    const auto self = weak.lock();
+    auto self = weak.lock();
     if (self) {
       self->stuck_ = true;
       self->fail(captureError(CaptureErrorCode::DeviceFailed, format("The X server of %@ has ended", {self->name()})));

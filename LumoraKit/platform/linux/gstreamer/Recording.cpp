@@ -250,7 +250,7 @@ LMRErrorRef Recording::follow() {
     }
     if (!isEnding && endTracks()) {
       isEnding = true;
-      const LMRErrorRef error = isEmpty() ? nothingRecorded() : reason();
+      LMRErrorRef error = isEmpty() ? nothingRecorded() : reason();
       tell(RecordingEvent::WillFinish, error);
       if (isEmpty()) {
         return error;

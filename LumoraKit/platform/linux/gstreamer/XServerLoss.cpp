@@ -16,7 +16,8 @@ std::atomic<XIOErrorHandler> handlerBefore{nullptr};
 // process ends.
 int serverLost(Display* display) {
   if (observer) {
-    const auto kept = observer();
+    // What the observer hands out must not die on this thread.
+    [[maybe_unused]] const auto kept = observer();
     while (true) {
       ::pause();
     }
