@@ -141,7 +141,7 @@ LMRErrorRef LMRSubmissionQueue::save(const Entry& entry) const {
 
 LMRErrorRef LMRSubmissionQueue::erase(const std::string& identifier) {
   const Entry* const entry = find(identifier);
-  const LMRErrorRef error = Platform::current().files->removeFile(fileOf(entry->submission));
+  LMRErrorRef error = Platform::current().files->removeFile(fileOf(entry->submission));
   if (!error) {
     std::erase_if(entries_, [&](const Entry& candidate) { return candidate.submission.identifier == identifier; });
   }
@@ -213,7 +213,7 @@ LMRErrorRef LMRSubmissionQueue::remove(const std::string& identifier) {
   if (identifier == current_) {
     return refusal("The file is being submitted");
   }
-  const LMRErrorRef error = find(identifier) ? erase(identifier) : refusal("There is no such submission");
+  LMRErrorRef error = find(identifier) ? erase(identifier) : refusal("There is no such submission");
   if (!error) {
     postChange();
   }
