@@ -92,7 +92,7 @@ Source chooseRemoteCamera(const std::shared_ptr<LMRSession>& session) {
 stage::Beginnings record(LMRMultipleSourceRecorder& recorder, Progress& progress, double seconds) {
   recorder.start();
   progress.waitFor(recorder, "Starting", [&] { return recorder.isRecording(); });
-  const stage::Beginnings beginnings(recorder.sourceRecorders());
+  stage::Beginnings beginnings(recorder.sourceRecorders());
   progress.waitFor(recorder, "Recording", [&] { return recorder.elapsedRecordingTime() >= seconds / 2; });
   recorder.pause();
   progress.waitFor(recorder, "Pausing", [&] { return recorder.isPaused(); });
