@@ -25,7 +25,7 @@ Session made(const Session& session, const LMRErrorRef& error, const std::string
 // There is no ready-made session of a camera without sound.
 Session sessionOf(const Device& camera) {
   lumora::MediaCapture& capture = *lumora::Platform::current().mediaCapture;
-  const Session session = capture.makeSession();
+  Session session = capture.makeSession();
   require(camera->open());
   require(session->addInput(capture.makeDeviceInput(camera)));
   return session;
