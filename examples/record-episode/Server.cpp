@@ -56,12 +56,11 @@ std::vector<lumora::Dictionary> Server::episodes() const {
 }
 
 std::vector<std::string> Server::mediaFacts(const std::filesystem::path& movie) const {
-  std::istringstream tracks(run("/usr/bin/ffprobe",
-                                {"-v", "error", "-count_packets", "-show_entries",
-                                 "stream=codec_type,codec_name,width,height,sample_rate,channels,"
-                                 "nb_read_packets,duration",
-                                 "-of", "compact=print_section=0", movie},
-                                {}));
+  static const std::string facts =
+      "stream=codec_type,codec_name,width,height,sample_rate,channels,nb_read_packets,duration";
+  std::istringstream tracks(run(
+      "/usr/bin/ffprobe",
+      {"-v", "error", "-count_packets", "-show_entries", facts, "-of", "compact=print_section=0", movie.string()}, {}));
   std::vector<std::string> lines;
   for (std::string track; std::getline(tracks, track);) {
     lines.push_back(described(track));
@@ -81,7 +80,7 @@ void Server::keepMovies(const std::filesystem::path& folder) const {
   }
 }
 
-std::string Server::sandbox(std::vector<std::string> arguments, const std::string& input) const {
+std::string Server::sandbox(const std::vector<std::string>& arguments, const std::string& input) const {
   return run(LUMORA_SANDBOX_PROGRAM, arguments, input);
 }
 

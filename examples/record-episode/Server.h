@@ -26,7 +26,7 @@ public:
   void keepMovies(const std::filesystem::path& folder) const;
 
 private:
-  std::string sandbox(std::vector<std::string> arguments, const std::string& input = {}) const;
+  std::string sandbox(const std::vector<std::string>& arguments, const std::string& input = {}) const;
   std::string run(const std::string& program, const std::vector<std::string>& arguments,
                   const std::string& input) const;
 
