@@ -19,9 +19,10 @@ protected:
     ASSERT_TRUE(keyring_.start());
   }
   // Without the password file that other tests give.
-  static ProgramRun runPlainly(std::vector<std::string> arguments) {
-    arguments.insert(arguments.begin(), LUMORA_CLIENT_PROGRAM);
-    return lumora::tests::runToEnd(arguments);
+  static ProgramRun runPlainly(const std::vector<std::string>& arguments) {
+    std::vector<std::string> command{LUMORA_CLIENT_PROGRAM};
+    command.insert(command.end(), arguments.begin(), arguments.end());
+    return lumora::tests::runToEnd(command);
   }
 
   TestKeyring keyring_;
