@@ -63,12 +63,16 @@
 #include <LumoraKit/recording/LMRLocalAudioRecorder.h>
 #include <LumoraKit/recording/LMRLocalScreenRecorder.h>
 #include <LumoraKit/recording/LMRLocalVideoRecorder.h>
+#include <LumoraKit/recording/LMRMovieFile.h>
 #include <LumoraKit/recording/LMRMultipleSourceRecorder.h>
 #include <LumoraKit/recording/LMRRecorderClasses.h>
+#include <LumoraKit/recording/LMRRecordingJournal.h>
+#include <LumoraKit/recording/LMRRecordingNote.h>
 #include <LumoraKit/recording/LMRRemoteAudioRecorder.h>
 #include <LumoraKit/recording/LMRRemoteVideoRecorder.h>
 #include <LumoraKit/recording/LMRSourceRecorder.h>
 #include <LumoraKit/recording/LMRSourceRecorderDelegate.h>
+#include <LumoraKit/recording/LMRUnfinishedRecording.h>
 #include <LumoraKit/workflows/LMRSubmission.h>
 #include <LumoraKit/workflows/LMRSubmissionQueue.h>
 #include <LumoraKit/workflows/LMRWorkflowAdditions.h>

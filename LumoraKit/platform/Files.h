@@ -2,6 +2,7 @@
 
 #include <LumoraKit/platform/LMRError.h>
 
+#include <cstddef>
 #include <cstdint>
 #include <filesystem>
 #include <memory>
@@ -28,6 +29,15 @@ public:
                                                                  LMRErrorRef* error) = 0;
   /// The whole content; nothing, with the error set, when it cannot be read.
   virtual std::optional<std::string> contentOfFile(const std::filesystem::path& path, LMRErrorRef* error) = 0;
+  /// The length of a file of bytes; nothing, with the error set, for anything else (EINVAL).
+  virtual std::optional<std::uint64_t> sizeOfFile(const std::filesystem::path& path, LMRErrorRef* error) = 0;
+  /// That many bytes from that place on, or fewer where the file ends; nothing, with the error set, when it cannot be
+  /// read.
+  virtual std::optional<std::string> partOfFile(const std::filesystem::path& path, std::uint64_t offset,
+                                                std::size_t length, LMRErrorRef* error) = 0;
+  /// Cuts a file to a length and waits until the disk has it; a length beyond its end is an error (EINVAL). Null on
+  /// success.
+  virtual LMRErrorRef truncateFile(const std::filesystem::path& path, std::uint64_t length) = 0;
   /// Takes a lock that one holder among all processes has until the result goes; the file is there for nothing else,
   /// is made when it is missing, and stays. Null, with the error set, when somebody has it already (EWOULDBLOCK) or
   /// the file cannot be made. Returns at once.

@@ -9,6 +9,7 @@
 
 #include <algorithm>
 #include <limits>
+#include <numeric>
 #include <utility>
 
 namespace {
@@ -47,6 +48,22 @@ double LMRDiskSpace::secondsLeft() const {
   return static_cast<double>(availableBytes - lowWaterMark) * bitsInByte / static_cast<double>(bitsPerSecond);
 }
 
+std::optional<LMRDiskSpace> LMRDiskSpace::spaceInFolder_bitRates_lowWaterMark(
+    const std::filesystem::path& folder, const std::vector<std::uint64_t>& bitRates, std::uint64_t lowWaterMark) {
+  auto& files = *lumora::Platform::current().files;
+  auto existing = folder;
+  while (!files.isDirectory(existing) && existing.has_relative_path()) {
+    existing = existing.parent_path();
+  }
+  const auto available = files.availableSpace(existing);
+  if (!available) {
+    return std::nullopt;
+  }
+  const auto rate = std::accumulate(bitRates.begin(), bitRates.end(), std::uint64_t{0});
+  const std::uint64_t leastMark = rate / bitsInByte * LMRDiskSpaceWatch::leastSecondsLeft;
+  return LMRDiskSpace{folder, *available, rate, std::max(lowWaterMark, leastMark)};
+}
+
 std::shared_ptr<LMRDiskSpaceWatch>
 LMRDiskSpaceWatch::watchWithRecorder(const std::shared_ptr<LMRSourceRecorder>& recorder) {
   return std::make_shared<LMRDiskSpaceWatch>(MadeByFactory(), recorder);
@@ -64,9 +81,8 @@ std::vector<LMRDiskSpace> LMRDiskSpaceWatch::forecast() const {
     return spaces;
   }
   for (const auto& [folder, rate] : bitRates(recorder)) {
-    if (const auto available = lumora::Platform::current().files->availableSpace(folder)) {
-      const std::uint64_t mark = std::max(lowWaterMark(), rate / bitsInByte * leastSecondsLeft);
-      spaces.push_back({folder, *available, rate, mark});
+    if (auto space = LMRDiskSpace::spaceInFolder_bitRates_lowWaterMark(folder, {rate}, lowWaterMark())) {
+      spaces.push_back(std::move(*space));
     }
   }
   return spaces;

@@ -8,6 +8,7 @@
 #include <map>
 #include <memory>
 #include <mutex>
+#include <optional>
 #include <string_view>
 #include <vector>
 
@@ -29,6 +30,14 @@ struct LUMORA_EXPORT LMRDiskSpace {
   bool isLow() const { return availableBytes < lowWaterMark; }
   /// How long can be recorded until the room is low; infinite when nothing is recorded there.
   double secondsLeft() const;
+
+  /// The room in a folder for sources that take so many bits a second each (MovieFileOutput::expectedBitRate()), also
+  /// when nobody is recording. For a folder that is yet to be made it is that of the nearest one above. Nothing when
+  /// the system does not tell. Blocks for as long as the disk takes to answer. Any thread. \param lowWaterMark in
+  /// bytes; raised as LMRDiskSpaceWatch::leastSecondsLeft says
+  static std::optional<LMRDiskSpace> spaceInFolder_bitRates_lowWaterMark(const std::filesystem::path& folder,
+                                                                         const std::vector<std::uint64_t>& bitRates,
+                                                                         std::uint64_t lowWaterMark);
 };
 
 /// Forecasts, before the start, how long a recording can be, and watches the disk while it is made.

@@ -66,6 +66,40 @@ std::optional<std::string> FakeFiles::contentOfFile(const std::filesystem::path&
   return found;
 }
 
+std::optional<std::uint64_t> FakeFiles::sizeOfFile(const std::filesystem::path& path, LMRErrorRef* error) {
+  if (isDirectory(path)) {
+    report(error, EINVAL, path);
+    return std::nullopt;
+  }
+  const auto found = contentOfFile(path, error);
+  return found ? std::optional<std::uint64_t>(found->size()) : std::nullopt;
+}
+
+std::optional<std::string> FakeFiles::partOfFile(const std::filesystem::path& path, std::uint64_t offset,
+                                                 std::size_t length, LMRErrorRef* error) {
+  const auto found = contentOfFile(path, error);
+  if (!found) {
+    return std::nullopt;
+  }
+  return offset < found->size() ? found->substr(static_cast<std::size_t>(offset), length) : std::string();
+}
+
+LMRErrorRef FakeFiles::truncateFile(const std::filesystem::path& path, std::uint64_t length) {
+  const std::lock_guard lock(mutex_);
+  const auto found = files_.find(cleaned(path));
+  int error = failure_;
+  if (error == 0 && found == files_.end()) {
+    error = ENOENT;
+  }
+  if (error == 0 && length > found->second.size()) {
+    error = EINVAL;
+  }
+  if (error == 0) {
+    found->second.resize(static_cast<std::size_t>(length));
+  }
+  return errorUnlessZero(error, path);
+}
+
 std::shared_ptr<void> FakeFiles::lockFile(const std::filesystem::path& path, LMRErrorRef* error) {
   const std::lock_guard lock(mutex_);
   std::weak_ptr<void>& holder = locks_[cleaned(path)];

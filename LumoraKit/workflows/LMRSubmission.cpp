@@ -1,6 +1,5 @@
+#include <LumoraKit/platform/ReadEntry.h>
 #include <LumoraKit/workflows/LMRSubmission.h>
-
-#include <limits>
 
 namespace {
 
@@ -16,36 +15,6 @@ constexpr std::string_view userNameKey = "user";
 constexpr std::string_view heldKey = "held";
 constexpr std::string_view attemptsKey = "attempts";
 constexpr std::string_view lastErrorKey = "last_error";
-
-// False when there is no such value.
-bool read(const lumora::Dictionary& dictionary, std::string_view key, std::string& text) {
-  const auto found = dictionary.string(key);
-  text = found.value_or("");
-  return found.has_value();
-}
-
-bool read(const lumora::Dictionary& dictionary, std::string_view key, lumora::Dictionary& entries) {
-  const lumora::Dictionary* const found = dictionary.dictionary(key);
-  entries = found ? *found : lumora::Dictionary();
-  return found != nullptr;
-}
-
-bool read(const lumora::Dictionary& dictionary, std::string_view key, bool& flag) {
-  const lumora::Value* const value = dictionary.find(key);
-  const auto found = value ? value->boolean() : std::nullopt;
-  flag = found.value_or(false);
-  return found.has_value();
-}
-
-template <class Number> bool readNumber(const lumora::Dictionary& dictionary, std::string_view key, Number& number) {
-  const lumora::Value* const value = dictionary.find(key);
-  const auto found = value ? value->unsignedInteger() : std::nullopt;
-  if (!found || *found > std::numeric_limits<Number>::max()) {
-    return false;
-  }
-  number = static_cast<Number>(*found);
-  return true;
-}
 
 } // namespace
 
@@ -72,17 +41,19 @@ lumora::Dictionary LMRSubmission::dictionaryRepresentation() const {
 }
 
 std::optional<LMRSubmission> LMRSubmission::submissionWithDictionary(const lumora::Dictionary& dictionary) {
+  using lumora::readEntry;
   LMRSubmission submission;
   std::string file;
   bool isHeld = false;
   const bool isComplete =
-      read(dictionary, identifierKey, submission.identifier) && read(dictionary, fileKey, file) &&
-      read(dictionary, submissionUUIDKey, submission.submissionUUID) &&
-      read(dictionary, userMetadataKey, submission.userMetadata) &&
-      read(dictionary, recordingMetadataKey, submission.recordingMetadata) &&
-      read(dictionary, deleteKey, submission.deleteAfterSubmission) && read(dictionary, serverKey, submission.server) &&
-      readNumber(dictionary, portKey, submission.port) && read(dictionary, userNameKey, submission.userName) &&
-      read(dictionary, heldKey, isHeld) && readNumber(dictionary, attemptsKey, submission.attempts);
+      readEntry(dictionary, identifierKey, submission.identifier) && readEntry(dictionary, fileKey, file) &&
+      readEntry(dictionary, submissionUUIDKey, submission.submissionUUID) &&
+      readEntry(dictionary, userMetadataKey, submission.userMetadata) &&
+      readEntry(dictionary, recordingMetadataKey, submission.recordingMetadata) &&
+      readEntry(dictionary, deleteKey, submission.deleteAfterSubmission) &&
+      readEntry(dictionary, serverKey, submission.server) && readEntry(dictionary, portKey, submission.port) &&
+      readEntry(dictionary, userNameKey, submission.userName) && readEntry(dictionary, heldKey, isHeld) &&
+      readEntry(dictionary, attemptsKey, submission.attempts);
   if (!isComplete) {
     return std::nullopt;
   }

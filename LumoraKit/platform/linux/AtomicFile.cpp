@@ -105,6 +105,38 @@ std::optional<std::string> contentOfFile(const std::filesystem::path& path) {
   return std::nullopt;
 }
 
+std::optional<std::string> partOfFile(const std::filesystem::path& path, std::uint64_t offset, std::size_t length) {
+  const FileDescriptor file(open(path.c_str(), O_RDONLY | O_CLOEXEC));
+  std::string part(file.isOpen() ? length : 0, '\0');
+  std::size_t filled = 0;
+  while (file.isOpen()) {
+    const auto place = static_cast<off_t>(offset + filled);
+    const ssize_t count = pread(file.get(), part.data() + filled, part.size() - filled, place);
+    if (count == 0) {
+      part.resize(filled);
+      return part;
+    }
+    if (count > 0) {
+      filled += static_cast<std::size_t>(count);
+    } else if (errno != EINTR) {
+      break;
+    }
+  }
+  return std::nullopt;
+}
+
+LMRErrorRef truncateFile(const std::filesystem::path& path, std::uint64_t length) {
+  const FileDescriptor file(open(path.c_str(), O_WRONLY | O_CLOEXEC));
+  struct stat facts {};
+  bool succeeded = file.isOpen() && fstat(file.get(), &facts) == 0;
+  if (succeeded && length > static_cast<std::uint64_t>(facts.st_size)) {
+    errno = EINVAL;
+    succeeded = false;
+  }
+  succeeded = succeeded && ftruncate(file.get(), static_cast<off_t>(length)) == 0 && fsync(file.get()) == 0;
+  return succeeded ? nullptr : LMRError::fromErrno(errno, path.string());
+}
+
 LMRErrorRef makeDirectories(const std::filesystem::path& path, mode_t permissions) {
   std::filesystem::path current;
   for (const auto& part : path) {

@@ -2,6 +2,8 @@
 
 #include <LumoraKit/platform/LMRError.h>
 
+#include <cstddef>
+#include <cstdint>
 #include <filesystem>
 #include <optional>
 #include <string>
@@ -18,6 +20,13 @@ LUMORA_INTERNAL LMRErrorRef replaceFile(const std::filesystem::path& path, std::
 
 /// The whole content of a file; nothing, with errno set, when it cannot be read.
 LUMORA_INTERNAL std::optional<std::string> contentOfFile(const std::filesystem::path& path);
+
+/// That many bytes from that place on, or fewer where the file ends; nothing, with errno set, when it cannot be read.
+LUMORA_INTERNAL std::optional<std::string> partOfFile(const std::filesystem::path& path, std::uint64_t offset,
+                                                      std::size_t length);
+
+/// Cuts a file to a length, which is not beyond its end (EINVAL), and flushes it to the disk. Null on success.
+LUMORA_INTERNAL LMRErrorRef truncateFile(const std::filesystem::path& path, std::uint64_t length);
 
 /// Makes a folder with its missing parents, with these permissions less the umask. Null on success, also when it is
 /// there already.

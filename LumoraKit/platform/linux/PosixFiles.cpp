@@ -62,6 +62,29 @@ std::optional<std::string> PosixFiles::contentOfFile(const std::filesystem::path
   return content;
 }
 
+std::optional<std::uint64_t> PosixFiles::sizeOfFile(const std::filesystem::path& path, LMRErrorRef* error) {
+  struct stat facts {};
+  const int failure = stat(path.c_str(), &facts) == 0 ? 0 : errno;
+  if (failure != 0 || !S_ISREG(facts.st_mode)) {
+    report(error, failure != 0 ? failure : EINVAL, path);
+    return std::nullopt;
+  }
+  return static_cast<std::uint64_t>(facts.st_size);
+}
+
+std::optional<std::string> PosixFiles::partOfFile(const std::filesystem::path& path, std::uint64_t offset,
+                                                  std::size_t length, LMRErrorRef* error) {
+  auto part = backend::partOfFile(path, offset, length);
+  if (!part) {
+    report(error, errno, path);
+  }
+  return part;
+}
+
+LMRErrorRef PosixFiles::truncateFile(const std::filesystem::path& path, std::uint64_t length) {
+  return backend::truncateFile(path, length);
+}
+
 std::shared_ptr<void> PosixFiles::lockFile(const std::filesystem::path& path, LMRErrorRef* error) {
   auto lock = std::make_shared<FileLock>();
   const LMRErrorRef failure = lock->take(path, FileLock::Time::min());

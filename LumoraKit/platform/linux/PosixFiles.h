@@ -15,6 +15,10 @@ public:
   std::vector<std::filesystem::path> contentsOfDirectory(const std::filesystem::path& path,
                                                          LMRErrorRef* error) override;
   std::optional<std::string> contentOfFile(const std::filesystem::path& path, LMRErrorRef* error) override;
+  std::optional<std::uint64_t> sizeOfFile(const std::filesystem::path& path, LMRErrorRef* error) override;
+  std::optional<std::string> partOfFile(const std::filesystem::path& path, std::uint64_t offset, std::size_t length,
+                                        LMRErrorRef* error) override;
+  LMRErrorRef truncateFile(const std::filesystem::path& path, std::uint64_t length) override;
   std::shared_ptr<void> lockFile(const std::filesystem::path& path, LMRErrorRef* error) override;
   LMRErrorRef createDirectory(const std::filesystem::path& path) override;
   LMRErrorRef writeAtomically(const std::filesystem::path& path, std::string_view content) override;

@@ -8,6 +8,7 @@
 
 #include <LumoraKit/platform/MediaCapture.h>
 #include <LumoraKit/platform/Platform.h>
+#include <LumoraKit/recording/LMRMovieFile.h>
 
 #include <gtest/gtest.h>
 
@@ -68,6 +69,15 @@ void expectTrack(const Movie& movie, const char* type, double recorded, const st
   EXPECT_GT(times.back(), recorded - mayLack) << what;
 }
 
+// What the framework itself makes of it.
+void expectRepair(const std::filesystem::path& file, double recorded, const std::string& what) {
+  auto movie = LMRMovieFile::movieFileWithPath(file);
+  EXPECT_GT(movie.duration, recorded - mayLack) << what;
+  EXPECT_LT(movie.lostSeconds(), 2 * mayLack) << what;
+  EXPECT_EQ(movie.repair(), nullptr) << what;
+  EXPECT_TRUE(LMRMovieFile::movieFileWithPath(file).isPlayable()) << what;
+}
+
 // A file that is younger than what may be lacking may be anything.
 void expectFiles(const Victim& victim, double recorded) {
   if (recorded < mayLack) {
@@ -83,6 +93,7 @@ void expectFiles(const Victim& victim, double recorded) {
     if (i != 1) {
       expectTrack(movie, "a", recorded, what);
     }
+    expectRepair(victim.files()[i], recorded, what);
   }
 }
 

@@ -11,6 +11,7 @@
 #include <LumoraKit/recording/LMRLocalAudioRecorder.h>
 #include <LumoraKit/recording/LMRLocalScreenRecorder.h>
 #include <LumoraKit/recording/LMRMultipleSourceRecorder.h>
+#include <LumoraKit/recording/LMRRecordingJournal.h>
 #include <LumoraKit/testing/FakePreferences.h>
 
 #include <array>
@@ -67,6 +68,11 @@ int recordUntilKilled(const std::string& camera, const std::filesystem::path& fo
   const auto delegate = std::make_shared<lumora::tests::RecordingDelegate>();
   recorder->setDelegate(delegate);
   recorder->bootstrap();
+  const auto journal = LMRRecordingJournal::journalWithFolder_error(folder / "notes", nullptr);
+  auto note = LMRRecordingNote::noteWithRecorder(recorder);
+  if (const auto error = journal->open(note)) {
+    return complain(error);
+  }
   for (const auto& source : sources) {
     if (const auto error = source->captureSession()->startRunning()) {
       return complain(error);

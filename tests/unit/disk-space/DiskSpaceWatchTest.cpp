@@ -64,6 +64,20 @@ TEST_F(DiskSpaceWatch, forecastsTheTimeUntilTheMark_fromTheBitRate) {
   EXPECT_DOUBLE_EQ(spaces[0].secondsLeft(), 600);
 }
 
+TEST_F(DiskSpaceWatch, forecastsForBitRates_withoutARecorder) {
+  leave(1'100 * megabyte);
+  const auto space =
+      LMRDiskSpace::spaceInFolder_bitRates_lowWaterMark("/movies", {6 * megabyte, 2 * megabyte}, 100 * megabyte);
+  ASSERT_TRUE(space);
+  EXPECT_EQ(space->folder, "/movies");
+  EXPECT_EQ(space->bitsPerSecond, 8 * megabyte);
+  EXPECT_DOUBLE_EQ(space->secondsLeft(), 1000);
+  const auto raised = LMRDiskSpace::spaceInFolder_bitRates_lowWaterMark("/movies", {8 * megabyte}, 0);
+  EXPECT_EQ(raised->lowWaterMark, 10 * megabyte);
+  platform_.files->setAvailableSpace(std::nullopt);
+  EXPECT_FALSE(LMRDiskSpace::spaceInFolder_bitRates_lowWaterMark("/movies", {}, 0));
+}
+
 TEST_F(DiskSpaceWatch, forecastsNoTime_whenTheRoomIsLowAlready) {
   leave(499 * megabyte);
   EXPECT_TRUE(watch_->forecast()[0].isLow());

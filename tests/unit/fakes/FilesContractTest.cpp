@@ -72,6 +72,37 @@ TEST_P(FilesContract, removesFileOnce) {
   EXPECT_EQ(code(files_->removeFile(folder_ / "file")), ENOENT);
 }
 
+TEST_P(FilesContract, tellsTheSizeOfAFile_andOfNothingElse) {
+  ASSERT_EQ(files_->writeAtomically(folder_ / "file", "0123456789"), nullptr);
+  EXPECT_EQ(files_->sizeOfFile(folder_ / "file", nullptr), 10U);
+  LMRErrorRef error;
+  EXPECT_EQ(files_->sizeOfFile(folder_ / "absent", &error), std::nullopt);
+  EXPECT_EQ(code(error), ENOENT);
+  EXPECT_EQ(files_->sizeOfFile(folder_.path(), &error), std::nullopt);
+  EXPECT_EQ(code(error), EINVAL);
+}
+
+TEST_P(FilesContract, readsAPart_upToTheEndOfTheFile) {
+  ASSERT_EQ(files_->writeAtomically(folder_ / "file", "0123456789"), nullptr);
+  EXPECT_EQ(files_->partOfFile(folder_ / "file", 0, 4, nullptr), "0123");
+  EXPECT_EQ(files_->partOfFile(folder_ / "file", 8, 4, nullptr), "89");
+  EXPECT_EQ(files_->partOfFile(folder_ / "file", 8, 0, nullptr), "");
+  EXPECT_EQ(files_->partOfFile(folder_ / "file", 10, 4, nullptr), "");
+  EXPECT_EQ(files_->partOfFile(folder_ / "file", 1ULL << 40U, 4, nullptr), "");
+  LMRErrorRef error;
+  EXPECT_EQ(files_->partOfFile(folder_ / "absent", 0, 4, &error), std::nullopt);
+  EXPECT_EQ(code(error), ENOENT);
+}
+
+TEST_P(FilesContract, cutsAFile_andMakesNoneLonger) {
+  ASSERT_EQ(files_->writeAtomically(folder_ / "file", "0123456789"), nullptr);
+  EXPECT_EQ(files_->truncateFile(folder_ / "file", 4), nullptr);
+  EXPECT_EQ(files_->contentOfFile(folder_ / "file", nullptr), "0123");
+  EXPECT_EQ(code(files_->truncateFile(folder_ / "file", 5)), EINVAL);
+  EXPECT_EQ(files_->contentOfFile(folder_ / "file", nullptr), "0123");
+  EXPECT_EQ(code(files_->truncateFile(folder_ / "absent", 0)), ENOENT);
+}
+
 TEST(FakeFiles, keepsWhatWasWrittenLast) {
   fakes::FakeFiles files;
   EXPECT_EQ(files.writeAtomically("/file", "old"), nullptr);
