@@ -21,7 +21,10 @@ LMRErrorRef refusal(const std::string& why) {
 constexpr const char* otherSession = "The recording was made for another server or user";
 
 lumora::Dictionary recordingMetadata(lumora::Date began, double duration) {
-  const auto whole = std::chrono::round<std::chrono::seconds>(std::chrono::duration<double>(duration));
+  // A damaged file may claim more than a date can take.
+  constexpr std::chrono::duration<double> longest = std::chrono::years(1);
+  const auto whole =
+      std::chrono::round<std::chrono::seconds>(std::min(std::chrono::duration<double>(duration), longest));
   return {{std::string(LMREpisodeRecordingMetadataStartDateKey), began},
           {std::string(LMREpisodeRecordingMetadataStopDateKey), began + whole},
           {std::string(LMREpisodeRecordingMetadataDurationKey), duration}};

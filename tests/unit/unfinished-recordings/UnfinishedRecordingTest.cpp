@@ -117,6 +117,18 @@ TEST_F(UnfinishedRecording, tellsTheServerWhenItBeganAndHowLongItIs) {
   EXPECT_EQ(*metadata.find(LMREpisodeRecordingMetadataDurationKey), lumora::Value(1.6));
 }
 
+TEST_F(UnfinishedRecording, hasAnEnd_whateverItsFileClaims) {
+  using namespace lumora::tests;
+  const auto time = box("tfdt", versionAndFlags(0, 1) + number(~std::uint64_t{0}, 8));
+  const auto header = box("tfhd", versionAndFlags(0) + number(1));
+  write("/movies/screen.mov", fileType() + index() + box("moof", box("traf", header + time)) + box("mdat", ""));
+  note_.sources[2].submissionUUID = "S";
+  const auto& recording = found();
+  EXPECT_GT(recording.movies()[1].duration, 1e15);
+  EXPECT_EQ(*recording.submissions().at(0).recordingMetadata.find(LMREpisodeRecordingMetadataStopDateKey),
+            lumora::Value(note_.began + std::chrono::duration_cast<std::chrono::seconds>(std::chrono::years(1))));
+}
+
 TEST_F(UnfinishedRecording, makesNoContainer_whenItWasStopped) {
   note_.sources[0].submissionUUID = "A";
   note_.sources[1].submissionUUID = "B";
