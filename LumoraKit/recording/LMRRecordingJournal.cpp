@@ -133,6 +133,10 @@ std::optional<LMRRecordingNote> LMRRecordingJournal::read(const fs::path& file) 
   if (note && noteFile(note->identifier) == file) {
     return note;
   }
+  // One that has just been closed needs no word.
+  if (!Platform::current().files->isFile(file)) {
+    return std::nullopt;
+  }
   lumora::log("The note of a recording in %@ cannot be read: %@",
               {file.string(), error ? error->localizedDescription() : "it is not complete"});
   return std::nullopt;
