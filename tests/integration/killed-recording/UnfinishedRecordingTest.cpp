@@ -110,10 +110,15 @@ protected:
   std::shared_ptr<LMRSession> session_ = LMRSession::session();
 };
 
+// By two players that have nothing in common.
 void expectToPlay(const LMRMovieFile& file) {
   const Movie movie(file.file);
   EXPECT_TRUE(movie.decodes()) << file.file;
   EXPECT_NEAR(movie.duration(), file.duration, 0.1) << file.file;
+  const auto player = ChildProgram::start({"gst-launch-1.0", "-q", "playbin", "uri=file://" + file.file.string(),
+                                           "video-sink=fakesink", "audio-sink=fakesink"});
+  ASSERT_NE(player, nullptr);
+  EXPECT_TRUE(player->wait()) << file.file;
 }
 
 TEST_F(UnfinishedRecording, isFoundRepairedPlayedAndFiled_whenItsApplicationWasKilled) {
