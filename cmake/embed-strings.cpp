@@ -1,8 +1,8 @@
 // Turns strings tables into a C++ source: lumora-embed-strings OUTPUT TABLE...
 //
-// A table is UTF-8: entries `"key" = "text";` with comments (/* */ and //) around them. In both strings \" \\ \n are
-// escapes. \U2026 is kept as its six characters in a key, and refused in a text, which holds the character itself.
-// Anything else is an error that names file and line.
+// A table is UTF-8, and as StringsTable.h says. Anything else is an error that names file and line.
+
+#include "StringsTable.h"
 
 #include <algorithm>
 #include <cstdlib>
@@ -16,109 +16,6 @@
 #include <vector>
 
 namespace {
-
-using Entries = std::map<std::string, std::string>;
-
-class Parser {
-public:
-  explicit Parser(std::string_view text) : text_(text) {}
-
-  Entries parse() {
-    Entries entries;
-    for (skipSpace(); !atEnd(); skipSpace()) {
-      std::string key = string(true);
-      expect('=');
-      std::string text = string(false);
-      expect(';');
-      if (!entries.emplace(std::move(key), std::move(text)).second) {
-        fail("a key stands twice");
-      }
-    }
-    return entries;
-  }
-
-private:
-  [[noreturn]] void fail(const std::string& reason) const {
-    const auto line = 1 + std::count(text_.begin(), text_.begin() + static_cast<std::ptrdiff_t>(position_), '\n');
-    throw std::runtime_error(std::to_string(line) + ": " + reason);
-  }
-
-  bool atEnd() const { return position_ == text_.size(); }
-  bool startsWith(std::string_view word) const { return text_.substr(position_).starts_with(word); }
-
-  char next() {
-    if (atEnd()) {
-      fail("the table ends inside an entry");
-    }
-    return text_[position_++];
-  }
-
-  void skipPast(std::string_view word) {
-    const auto found = text_.find(word, position_);
-    if (found == std::string_view::npos) {
-      fail("a comment without its end");
-    }
-    position_ = found + word.size();
-  }
-
-  void skipSpace() {
-    while (!atEnd()) {
-      if (startsWith("/*")) {
-        skipPast("*/");
-      } else if (startsWith("//")) {
-        skipPast("\n");
-      } else if (std::string_view(" \t\n").find(text_[position_]) != std::string_view::npos) {
-        ++position_;
-      } else {
-        return;
-      }
-    }
-  }
-
-  void expect(char character) {
-    skipSpace();
-    if (next() != character) {
-      --position_;
-      fail(std::string("expected ") + character);
-    }
-  }
-
-  std::string string(bool isKey) {
-    expect('"');
-    std::string content;
-    for (char character = next(); character != '"'; character = next()) {
-      if (character == '\n') {
-        fail("a string without its end");
-      }
-      content += character == '\\' ? escaped(isKey) : std::string(1, character);
-    }
-    if (content.empty()) {
-      fail("an empty string");
-    }
-    return content;
-  }
-
-  std::string escaped(bool isKey) {
-    switch (next()) {
-    case '"':
-      return "\"";
-    case '\\':
-      return "\\";
-    case 'n':
-      return "\n";
-    case 'U':
-      if (isKey && startsWith("2026")) {
-        return "\\U";
-      }
-      [[fallthrough]];
-    default:
-      fail("an escape that is not allowed here");
-    }
-  }
-
-  std::string_view text_;
-  std::size_t position_ = 0;
-};
 
 // The length of the UTF-8 sequence that a byte opens; 0 for a byte that opens none.
 std::size_t sequenceLength(unsigned char byte) {
@@ -161,14 +58,14 @@ std::string literal(std::string_view text) {
   return result + "\"";
 }
 
-Entries readTable(const std::string& path) {
+StringsTable::Entries readTable(const std::string& path) {
   std::ifstream file(path, std::ios::binary);
   const std::string content(std::istreambuf_iterator<char>(file), {});
   if (!file || !isUTF8(content)) {
     throw std::runtime_error(path + ": cannot be read as UTF-8");
   }
   try {
-    return Parser(content).parse();
+    return StringsTable(content).parse();
   } catch (const std::runtime_error& error) {
     throw std::runtime_error(path + ":" + error.what());
   }

@@ -1,18 +1,13 @@
+#include "Require.h"
+
 #include <LumoraKit/platform/PropertyList.h>
 
 #include <cstdint>
-#include <cstdlib>
 
 /// \file
 /// Feeds any bytes to the property-list reader. What it reads and writes again must read the same.
 
 namespace {
-
-void require(bool holds) {
-  if (!holds) {
-    std::abort();
-  }
-}
 
 void requireRefusal(const LMRErrorRef& error, std::size_t size) {
   require(error && error->domain() == lumora::PropertyListErrorDomain);

@@ -8,7 +8,6 @@
 #include <optional>
 #include <utility>
 
-using lumora::Files;
 using lumora::Platform;
 
 namespace {
@@ -16,7 +15,7 @@ namespace {
 // More than recordings of days have; what has more is made to keep its reader busy.
 constexpr int mostBoxes = 2'000'000;
 // More than the index of a recording of days takes.
-constexpr std::uint64_t longestIndex = 64 * 1024 * 1024;
+constexpr std::uint64_t longestIndex = 64'000'000;
 
 // Goes over the boxes of a file, one after another, up to the first that is not whole.
 class Scan {
