@@ -67,21 +67,26 @@ std::optional<std::string> FakeFiles::contentOfFile(const std::filesystem::path&
 }
 
 std::optional<std::uint64_t> FakeFiles::sizeOfFile(const std::filesystem::path& path, LMRErrorRef* error) {
-  if (isDirectory(path)) {
-    report(error, EINVAL, path);
+  const std::lock_guard lock(mutex_);
+  const auto clean = cleaned(path);
+  const auto found = files_.find(clean);
+  if (found == files_.end()) {
+    report(error, hasDirectory(clean) ? EINVAL : ENOENT, path);
     return std::nullopt;
   }
-  const auto found = contentOfFile(path, error);
-  return found ? std::optional<std::uint64_t>(found->size()) : std::nullopt;
+  return found->second.size();
 }
 
 std::optional<std::string> FakeFiles::partOfFile(const std::filesystem::path& path, std::uint64_t offset,
                                                  std::size_t length, LMRErrorRef* error) {
-  const auto found = contentOfFile(path, error);
-  if (!found) {
+  const std::lock_guard lock(mutex_);
+  const auto found = files_.find(cleaned(path));
+  if (found == files_.end()) {
+    report(error, ENOENT, path);
     return std::nullopt;
   }
-  return offset < found->size() ? found->substr(static_cast<std::size_t>(offset), length) : std::string();
+  const std::string& content = found->second;
+  return offset < content.size() ? content.substr(static_cast<std::size_t>(offset), length) : std::string();
 }
 
 LMRErrorRef FakeFiles::truncateFile(const std::filesystem::path& path, std::uint64_t length) {
