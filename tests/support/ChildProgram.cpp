@@ -4,10 +4,21 @@
 #include <filesystem>
 
 #include <sys/prctl.h>
+#include <unistd.h>
 
 namespace lumora::tests {
 
 using backend::GLibPtr;
+
+namespace {
+
+GSubprocessFlags flags = static_cast<GSubprocessFlags>(G_SUBPROCESS_FLAGS_STDIN_PIPE | G_SUBPROCESS_FLAGS_STDOUT_PIPE);
+
+} // namespace
+
+void ChildProgram::silenceErrors() {
+  flags = static_cast<GSubprocessFlags>(flags | G_SUBPROCESS_FLAGS_STDERR_SILENCE);
+}
 
 std::unique_ptr<ChildProgram> ChildProgram::start(const std::vector<std::string>& commandLine) {
   std::vector<const gchar*> words;
@@ -16,10 +27,15 @@ std::unique_ptr<ChildProgram> ChildProgram::start(const std::vector<std::string>
     words.push_back(word.c_str());
   }
   words.push_back(nullptr);
-  const GLibPtr<GSubprocessLauncher> launcher(g_subprocess_launcher_new(
-      static_cast<GSubprocessFlags>(G_SUBPROCESS_FLAGS_STDIN_PIPE | G_SUBPROCESS_FLAGS_STDOUT_PIPE)));
+  const GLibPtr<GSubprocessLauncher> launcher(g_subprocess_launcher_new(flags));
+  // A session of its own keeps Ctrl-C at the terminal from it: who started it ends it.
   g_subprocess_launcher_set_child_setup(
-      launcher.get(), [](gpointer) { prctl(PR_SET_PDEATHSIG, SIGKILL); }, nullptr, nullptr);
+      launcher.get(),
+      [](gpointer) {
+        prctl(PR_SET_PDEATHSIG, SIGKILL);
+        setsid();
+      },
+      nullptr, nullptr);
   GLibPtr<GSubprocess> process(g_subprocess_launcher_spawnv(launcher.get(), words.data(), nullptr));
   return process ? std::unique_ptr<ChildProgram>(new ChildProgram(std::move(process))) : nullptr;
 }

@@ -11,6 +11,9 @@ namespace lumora::tests {
 /// A program that a test talks to by lines; ended with the object, and when the test dies.
 class ChildProgram {
 public:
+  /// From now on nobody sees what the programs write to their standard error. To be called first.
+  static void silenceErrors();
+
   /// Null when it cannot be started.
   static std::unique_ptr<ChildProgram> start(const std::vector<std::string>& commandLine);
   /// This test program in another role.

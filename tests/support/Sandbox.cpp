@@ -60,6 +60,15 @@ ProgramRun SandboxServer::administrate(std::vector<std::string> command, const s
   return run(LUMORA_SANDBOX_PROGRAM, command, standardInput);
 }
 
+void SandboxServer::takeTickets(const std::filesystem::path& keytab, const std::string& principal) const {
+  for (const auto& run : {administrate({"single-sign-on", "enable"}, {"--keytab", keytab.string()}),
+                          administrate({"single-sign-on", "map"}, {principal, userName})}) {
+    if (run.status != 0) {
+      throw std::runtime_error("the server takes no tickets: " + run.standardError);
+    }
+  }
+}
+
 ProgramRun SandboxServer::request(const Array& request, const std::string& toolName) const {
   return requestText(xmlDescription(request).value(), toolName);
 }

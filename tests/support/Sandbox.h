@@ -50,6 +50,8 @@ public:
   /// administrate({"user", "remove"}, {"ada"}).
   ProgramRun administrate(std::vector<std::string> command, const std::vector<std::string>& arguments = {},
                           const std::string& standardInput = {}) const;
+  /// The server takes Kerberos tickets as well from now on, and lets the principal in as its user.
+  void takeTickets(const std::filesystem::path& keytab, const std::string& principal) const;
   /// Runs a tool with the request's property list on its standard input.
   ProgramRun request(const Array& request, const std::string& toolName = "lumctl") const;
   ProgramRun requestText(const std::string& request, const std::string& toolName = "lumctl") const;

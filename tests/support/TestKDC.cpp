@@ -3,10 +3,9 @@
 #include <LumoraKit/platform/Platform.h>
 #include <LumoraKit/platform/linux/FileDescriptor.h>
 
-#include <gtest/gtest.h>
-
 #include <algorithm>
 #include <cstdlib>
+#include <stdexcept>
 
 #include <arpa/inet.h>
 #include <netinet/in.h>
@@ -86,7 +85,7 @@ bool TestKDC::startAt(std::uint16_t port) {
   pointClientsAt(port);
   writeFile(folder_ / "kdc.conf", serverConfiguration(realm_, port, folder_.path()));
   if (!fs::exists(folder_ / "stash")) {
-    EXPECT_EQ(run(databaseProgram, {"create", "-s", "-r", realm_, "-P", "test"}), 0);
+    require(databaseProgram, {"create", "-s", "-r", realm_, "-P", "test"});
   }
   server_ = ChildProgram::start({serverProgram, "-n", "-r", realm_});
   for (std::string line = server_->readLine(); !line.empty(); line = server_->readLine()) {
@@ -132,7 +131,13 @@ void TestKDC::forgetRealm() {
 }
 
 void TestKDC::administrate(const std::string& query) {
-  EXPECT_EQ(run(administrationProgram, {"-r", realm_, "-q", query}), 0) << query;
+  require(administrationProgram, {"-r", realm_, "-q", query});
+}
+
+void TestKDC::require(const std::string& program, const std::vector<std::string>& arguments) {
+  if (const int status = run(program, arguments); status != 0) {
+    throw std::runtime_error(program + ": status " + std::to_string(status));
+  }
 }
 
 int TestKDC::run(const std::string& program, const std::vector<std::string>& arguments, const std::string& input) {

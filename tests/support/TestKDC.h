@@ -16,7 +16,7 @@ namespace lumora::tests {
 /// A Kerberos server (MIT krb5kdc) of one test's own, on a free port of this machine, with the caller's side of it:
 /// while it exists, this process and its children have its configuration and an empty credential cache in their
 /// environment. Needs no rights. Make one before a runner with a root is installed; a second one takes the first one's
-/// place in the environment.
+/// place in the environment. What cannot be set up fails the test and stops it there (an exception).
 ///
 ///     TestKDC kerberos;
 ///     ASSERT_TRUE(kerberos.start());
@@ -56,6 +56,7 @@ public:
 private:
   int run(const std::string& program, const std::vector<std::string>& arguments, const std::string& input = {});
   void administrate(const std::string& query);
+  void require(const std::string& program, const std::vector<std::string>& arguments);
   bool startAt(std::uint16_t port);
 
   const std::string realm_;

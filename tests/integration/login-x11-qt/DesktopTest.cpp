@@ -1,6 +1,5 @@
-#include "Desktop.h"
-
 #include "support/LoginQtTest.h"
+#include "support/TestDesktop.h"
 
 using lumora::tests::LoginQtTest;
 using testing::ElementsAre;
@@ -12,8 +11,8 @@ namespace {
 class DesktopTest : public LoginQtTest {
 protected:
   void SetUp() override {
-    if (!missingDesktop().empty()) {
-      GTEST_SKIP() << missingDesktop();
+    if (const auto obstacle = lumora::tests::TestDesktop::obstacle()) {
+      GTEST_SKIP() << *obstacle;
     }
     LoginQtTest::SetUp();
   }

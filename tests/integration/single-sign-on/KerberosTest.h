@@ -21,9 +21,7 @@ protected:
       kerberos_.addUser(name, "tickets");
     }
     keytab_ = kerberos_.addService(service);
-    const auto enabled = server_.administrate({"single-sign-on", "enable"}, {"--keytab", keytab_.string()});
-    ASSERT_EQ(enabled.status, 0) << enabled.standardError;
-    ASSERT_EQ(server_.administrate({"single-sign-on", "map"}, {principal("ada"), SandboxServer::userName}).status, 0);
+    server_.takeTickets(keytab_, principal("ada"));
   }
 
   static std::string principal(const std::string& name) { return name + "@" + TestKDC::realm; }
