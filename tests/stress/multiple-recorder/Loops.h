@@ -19,5 +19,5 @@ Loop plainLoop();
 Loop glibLoop();
 /// Of QCoreApplication, which on this platform iterates GLib's default context.
 Loop qtLoop();
-/// Of QCoreApplication told not to, with a lumora::MainThread of the application's own, installed meanwhile.
+/// Of QCoreApplication told not to, with the lumora::MainThread of lumorakit-qt, installed meanwhile.
 Loop qtLoopWithoutGLib();
