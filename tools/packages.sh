@@ -21,12 +21,15 @@ run_packages=(
 # A camera, a microphone and a screen for machines that have none.
 headless_packages=(dbus pipewire pipewire-bin pipewire-pulse wireplumber libspa-0.2-modules xvfb)
 
+# All that a login can meet, and a screen for machines that have none.
+login_packages=(dbus gnome-keyring avahi-daemon iproute2 krb5-kdc krb5-admin-server krb5-user xvfb jwm fonts-dejavu-core)
+
 demo_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
-test_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg polkitd xdg-desktop-portal man-db mandoc zsh krb5-kdc krb5-admin-server krb5-user jwm
-  gnome-keyring avahi-daemon iproute2)
+test_packages=("${headless_packages[@]}" "${login_packages[@]}" gstreamer1.0-tools ffmpeg polkitd xdg-desktop-portal man-db mandoc zsh
+  at-spi2-core gir1.2-atspi-2.0 python3-gi)
 bench_packages=(libbenchmark-dev libpipewire-0.3-dev gstreamer1.0-tools bsdextrautils dbus gnome-keyring)
-# The pictures of the login panel: an optimiser, and the letters that they show.
-picture_packages=(optipng fonts-dejavu-core fonts-ipaexfont-gothic)
+# The pictures of the login panel: an optimiser, the letters that they show, and a desktop's own style.
+picture_packages=(optipng fonts-dejavu-core fonts-ipaexfont-gothic adwaita-qt6)
 check_packages=(clang-format-14 git python3)
 lint_packages=(clang-14 clang-tidy-14 libclang-rt-14-dev python3)
 
