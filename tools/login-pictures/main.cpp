@@ -5,7 +5,9 @@
 #include <QFontInfo>
 #include <QPalette>
 #include <QProxyStyle>
+#include <QStyleFactory>
 #include <cstdlib>
+#include <iostream>
 
 // Draws the login panel in each of its states, for the pages in docs/. Nothing is shown on a screen.
 
@@ -21,7 +23,7 @@ QPalette darkPalette() {
 // Nothing moves, so that every picture is of an end.
 class StillStyle final : public QProxyStyle {
 public:
-  explicit StillStyle(QObject* owner) : QProxyStyle("fusion") { setParent(owner); }
+  StillStyle(const QString& name, QObject* owner) : QProxyStyle(name) { setParent(owner); }
 
   int styleHint(StyleHint hint, const QStyleOption* option, const QWidget* widget,
                 QStyleHintReturn* data) const override {
@@ -34,12 +36,12 @@ public:
 int main(int argc, char** argv) {
   ::setenv("QT_QPA_PLATFORM", "offscreen", 1);
   QApplication application(argc, argv);
-  QApplication::setStyle(new StillStyle(&application));
   QCommandLineParser parser;
   parser.setApplicationDescription("Draws the login panel in each of its states.");
   parser.addHelpOption();
   parser.addPositionalArgument("folder", "where the pictures go");
   parser.addOptions({{"name", "begins the name of each picture", "name", "light"},
+                     {"style", "how controls look", "style", "fusion"},
                      {"dark", "a dark palette"},
                      {"large", "a font of twice the size"},
                      {"language", "the user's language", "tag", "en"},
@@ -50,6 +52,11 @@ int main(int argc, char** argv) {
     parser.showHelp(EXIT_FAILURE);
   }
 
+  if (!QStyleFactory::keys().contains(parser.value("style"), Qt::CaseInsensitive)) {
+    std::cerr << "there is no style " << parser.value("style").toStdString() << '\n';
+    return EXIT_FAILURE;
+  }
+  QApplication::setStyle(new StillStyle(parser.value("style"), &application));
   if (parser.isSet("dark")) {
     QApplication::setPalette(darkPalette());
   }
