@@ -51,6 +51,9 @@ public:
     if (!index_->isFragmented && (!hasData_ || whole_ != size_)) {
       return "It is not complete, and has no parts that could be kept";
     }
+    if (size_ - whole_ > LMRMovieFile::mostLostBytes) {
+      return "It is damaged long before its end";
+    }
     return {};
   }
 
@@ -190,9 +193,6 @@ LMRErrorRef LMRMovieFile::repair() {
   const auto sizeNow = files.sizeOfFile(file, &error);
   if (sizeNow && *sizeNow != size) {
     error = refusal(file, "It has changed meanwhile");
-  }
-  if (lostBytes() > mostLostBytes) {
-    error = refusal(file, "It is damaged long before its end");
   }
   error = error ? error : files.truncateFile(file, usableSize);
   if (!error) {

@@ -26,13 +26,15 @@ struct LUMORA_EXPORT LMRMovieFile {
     Complete,
     /// Whole up to a place; what comes after it cannot be used. Most programs play it, some refuse it.
     Torn,
-    /// Not a movie, or one without a single whole fragment, or not to be read: the reason is in `reason`.
+    /// Not a movie, or one without a single whole fragment, or damaged long before its end, or not to be read: the
+    /// reason is in `reason`.
     Unusable,
     /// There is no such file.
     Missing,
   };
 
-  /// No recorder that is killed tears more than this, in bytes: a file with more after its whole part is damaged.
+  /// No recorder that is killed tears more than this, in bytes. A file with more after its whole part is damaged in
+  /// another way, and nothing that may yet be saved is cut off.
   static constexpr std::uint64_t mostLostBytes = 64'000'000;
 
   std::filesystem::path file;
@@ -58,7 +60,7 @@ struct LUMORA_EXPORT LMRMovieFile {
 
   /// Cuts a torn file to what is whole, in one step: after a crash in the midst of it the file is as before or
   /// repaired. Null on success, with the state Complete, and for a file that is complete already; an error, with the
-  /// file untouched, when it is unusable, missing, has changed since it was looked at, or would lose more than
-  /// mostLostBytes. Nobody may be writing it. Blocks for the disk. Any thread, but one at a time.
+  /// file untouched, when it is unusable, missing, or has changed since it was looked at. Nobody may be writing it.
+  /// Blocks for the disk. Any thread, but one at a time.
   LMRErrorRef repair();
 };

@@ -156,12 +156,14 @@ TEST_F(MovieFile, staysAsItIs_whenItHasChangedSinceItWasLookedAt) {
   EXPECT_EQ(platform_.files->content(path), movie() + "and written on");
 }
 
-TEST_F(MovieFile, staysAsItIs_whenMuchMoreIsLostThanAKillCanTear) {
-  const auto content = movie() + std::string(LMRMovieFile::mostLostBytes + 1, '\0');
-  auto damaged = look(content);
-  EXPECT_EQ(damaged.state, State::Torn);
+TEST_F(MovieFile, isUnusableAndStaysAsItIs_whenMuchMoreIsLostThanAKillCanTear) {
+  const std::string rest(LMRMovieFile::mostLostBytes, '\0');
+  EXPECT_EQ(look(movie() + rest).state, State::Torn);
+  auto damaged = look(movie() + rest + '\0');
+  EXPECT_EQ(damaged.state, State::Unusable);
+  EXPECT_THAT(damaged.reason, HasSubstr("damaged"));
   EXPECT_NE(damaged.repair(), nullptr);
-  EXPECT_EQ(platform_.files->content(path)->size(), content.size());
+  EXPECT_EQ(platform_.files->sizeOfFile(path, nullptr), movie().size() + rest.size() + 1);
 }
 
 TEST_F(MovieFile, staysTorn_whenTheDiskRefuses) {
