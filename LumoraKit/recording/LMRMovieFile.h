@@ -61,6 +61,6 @@ struct LUMORA_EXPORT LMRMovieFile {
   /// Cuts a torn file to what is whole, in one step: after a crash in the midst of it the file is as before or
   /// repaired. Null on success, with the state Complete, and for a file that is complete already; an error, with the
   /// file untouched, when it is unusable, missing, or has changed since it was looked at. Nobody may be writing it.
-  /// Blocks for the disk. Any thread, but one at a time.
+  /// Blocks for the disk. One thread at a time.
   LMRErrorRef repair();
 };

@@ -9,6 +9,8 @@ namespace {
 constexpr std::size_t shortHeader = 8;
 constexpr std::size_t typePlace = 4;
 constexpr std::size_t typeLength = 4;
+// More than a movie of ours has; the tracks are gone over for each fragment.
+constexpr std::size_t mostTracks = 100;
 
 // Reads numbers, most significant byte first. Beyond the end it gives zeros and is no longer sound.
 class Numbers {
@@ -264,7 +266,8 @@ std::optional<MovieIndex> movieIndex(std::string_view content) {
            : type == "trak" ? readTrack(box, index)
                             : type != "mvex" || readExtension(box, index);
   });
-  return isSound && !index.tracks.empty() ? std::optional(std::move(index)) : std::nullopt;
+  const bool hasTracks = !index.tracks.empty() && index.tracks.size() <= mostTracks;
+  return isSound && hasTracks ? std::optional(std::move(index)) : std::nullopt;
 }
 
 std::optional<std::uint64_t> addMovieFragment(std::string_view content, MovieIndex& index) {

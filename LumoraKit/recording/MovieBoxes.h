@@ -54,7 +54,7 @@ struct LUMORA_INTERNAL MovieIndex {
   double endOfFragments() const;
 };
 
-/// Reads the content of a "moov" box; nothing when it is damaged or has no track.
+/// Reads the content of a "moov" box; nothing when it is damaged, or has no track or very many.
 LUMORA_INTERNAL std::optional<MovieIndex> movieIndex(std::string_view content);
 
 /// Reads the content of a "moof" box, and takes the ends of its tracks into the index.

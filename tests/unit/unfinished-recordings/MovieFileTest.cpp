@@ -111,6 +111,11 @@ TEST_F(MovieFile, isNotKeptBusyByItsNumbers) {
   const auto header = box("tfhd", versionAndFlags(0x18) + number(1) + number(0xFFFFFFFF) + number(0xFFFFFFFF));
   const auto run = box("trun", versionAndFlags(0) + number(0xFFFFFFFF));
   expectTornAfter(movie(), box("moof", box("traf", header + run + run + run)) + box("mdat", "data"));
+  std::string tracks;
+  for (std::uint32_t id = 1; id < 1000; ++id) {
+    tracks += track(id, 1000);
+  }
+  EXPECT_EQ(look(fileType() + box("moov", tracks + box("mvex", "")) + fragment(0, 800, "data")).state, State::Unusable);
   const auto promise = box("trun", versionAndFlags(0x300) + number(0xFFFFFFFF) + number(1));
   expectTornAfter(movie(), box("moof", box("traf", header + promise)) + box("mdat", "data"));
 }
