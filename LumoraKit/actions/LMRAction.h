@@ -44,8 +44,10 @@ public:
   static std::shared_ptr<LMRAction> actionWithCommand_arguments(std::optional<std::string> command,
                                                                 std::optional<lumora::Array> arguments);
 
+  /// An action for a command of the main tool; see the factory functions.
   LMRAction(std::optional<std::string> command, std::optional<lumora::Array> arguments,
             std::shared_ptr<LMRSession> session);
+  /// The same without a session.
   LMRAction(std::optional<std::string> command, std::optional<lumora::Array> arguments);
   ~LMRAction() override;
 
@@ -57,6 +59,7 @@ public:
   std::optional<std::string> tool() const { return tool_.get(); }
   void setTool(std::optional<std::string> tool) { tool_.set(std::move(tool)); }
 
+  /// The command word of the request ("listworkflows"); nothing sends none.
   std::optional<std::string> command() const { return command_.get(); }
   void setCommand(std::optional<std::string> command) { command_.set(std::move(command)); }
 

@@ -48,6 +48,7 @@ public:
                                                       const std::optional<std::string>& path,
                                                       std::shared_ptr<LMRSession> session);
 
+  /// Deletes a workflow from the server. Its episodes stay.
   static std::shared_ptr<LMRAction> actionToDeleteWorkflowWithUUID_withSession(const std::optional<std::string>& uuid,
                                                                                std::shared_ptr<LMRSession> session);
 
@@ -60,6 +61,7 @@ public:
   /// Lists the cameras that the server can record with; LMRCamerasKey in the result.
   static std::shared_ptr<LMRAction> actionToListRemoteCamerasWithSession(std::shared_ptr<LMRSession> session);
 
+  /// Asks what a camera is doing: its state and the URL of its last preview image in the result.
   static std::shared_ptr<LMRAction> actionToGetStatusForRemoteCamera_session(const std::optional<std::string>& camera,
                                                                              std::shared_ptr<LMRSession> session);
 
@@ -73,8 +75,10 @@ public:
   actionToStartRemoteCamera_afterDelay_audioOnly_session(const std::optional<std::string>& camera, std::uint64_t delay,
                                                          bool audioOnly, std::shared_ptr<LMRSession> session);
 
+  /// Pauses the recording of a camera.
   static std::shared_ptr<LMRAction> actionToPauseRemoteCamera_session(const std::optional<std::string>& camera,
                                                                       std::shared_ptr<LMRSession> session);
+  /// Goes on with the paused recording of a camera.
   static std::shared_ptr<LMRAction> actionToResumeRemoteCamera_session(const std::optional<std::string>& camera,
                                                                        std::shared_ptr<LMRSession> session);
   /// Ends the recording and throws it away.
@@ -133,8 +137,8 @@ public:
   static std::shared_ptr<LMRAction> actionToGetRemoteRecorderConfiguration();
 
   /// Changes one setting of this machine's shared camera.
-  /// \param value,key required, not empty
-  /// \param key one of LMRRemoteRecorder...Key
+  /// \param value required, not empty
+  /// \param key required: one of LMRRemoteRecorder...Key
   /// \param authorization required; must outlive the action
   static std::shared_ptr<LMRPrivilegedAction>
   actionToSetRemoteRecorderConfigurationValue_forKey_authorization(const std::optional<std::string>& value,

@@ -31,12 +31,15 @@ inline constexpr std::string_view LMRHelperAgentIdentifier = "org.vantor.lumagen
 /// password (all asserted when the action runs).
 class LUMORA_EXPORT LMRPrivilegedAction : public LMRAction {
 public:
+  /// An action for a command of the helper agent, with a login session.
   static std::shared_ptr<LMRPrivilegedAction>
   actionWithCommand_arguments_session(std::optional<std::string> command, std::optional<lumora::Array> arguments,
                                       std::shared_ptr<LMRSession> session);
+  /// An action for a command that needs no session.
   static std::shared_ptr<LMRPrivilegedAction> actionWithCommand_arguments(std::optional<std::string> command,
                                                                           std::optional<lumora::Array> arguments);
 
+  /// The constructors of LMRAction, with the same meaning.
   using LMRAction::LMRAction;
   ~LMRPrivilegedAction() override;
 

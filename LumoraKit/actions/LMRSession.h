@@ -60,6 +60,7 @@ public:
   std::optional<std::string> userName() const { return userName_.get(); }
   void setUserName(std::optional<std::string> userName) { userName_.set(std::move(userName)); }
 
+  /// The user's name for people ("Ada Lovelace"), as the server told it at the login.
   std::optional<std::string> userFullName() const { return userFullName_.get(); }
   void setUserFullName(std::optional<std::string> userFullName) { userFullName_.set(std::move(userFullName)); }
 
@@ -68,6 +69,7 @@ public:
   std::optional<std::string> password() const;
   void setPassword(std::optional<std::string> password);
 
+  /// How the session proves who the user is. LMRAuthenticationTypeUnknown unless set.
   LMRAuthenticationType authenticationType() const { return authenticationType_; }
   void setAuthenticationType(LMRAuthenticationType type) { authenticationType_ = type; }
 

@@ -33,8 +33,10 @@ public:
   static std::shared_ptr<LMRAuthenticationAction> actionWithServer_port(std::optional<std::string> server,
                                                                         std::uint16_t port);
 
+  /// A login by password; see actionWithServer_port_userName_password().
   LMRAuthenticationAction(std::optional<std::string> server, std::uint16_t port, std::optional<std::string> userName,
                           std::optional<std::string> password);
+  /// A login by single sign-on; see actionWithServer_port().
   LMRAuthenticationAction(std::optional<std::string> server, std::uint16_t port);
   ~LMRAuthenticationAction() override;
 

@@ -19,6 +19,7 @@ public:
   /// \param bundleIdentifier the domain, as a rule an application's identifier
   explicit LMRFrameworkUserDefaults(std::optional<std::string> bundleIdentifier);
 
+  /// The domain that the values are kept in; nothing makes every value absent.
   std::optional<std::string> bundleIdentifier() const { return bundleIdentifier_.get(); }
   void setBundleIdentifier(std::optional<std::string> identifier) { bundleIdentifier_.set(std::move(identifier)); }
 
@@ -26,6 +27,7 @@ public:
   std::optional<lumora::Value> objectForKey(std::string_view key) const;
   /// Nothing as the value removes the key.
   void setObject_forKey(const std::optional<lumora::Value>& value, std::string_view key);
+  /// Removes the key; nothing happens when it is not there.
   void removeObjectForKey(std::string_view key);
 
 private:

@@ -34,6 +34,7 @@ public:
                                                const std::optional<std::string>& userName,
                                                const std::optional<std::string>& server);
 
+  /// Removes the user's password for that server; nothing happens when there is none.
   static void removePasswordForUserName_server(const std::optional<std::string>& userName,
                                                const std::optional<std::string>& server);
 

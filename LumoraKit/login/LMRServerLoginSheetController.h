@@ -36,8 +36,9 @@ public:
   /// The interface file of the window.
   static constexpr std::string_view windowNibName = "ServerLoginWindow";
 
-  /// What the delegate is told.
+  /// What the delegate is told when the user closed the sheet without a login.
   static constexpr int Cancelled = 0;
+  /// What the delegate is told when the login has succeeded; the session is the panel's.
   static constexpr int LoggedIn = 1;
 
   LMRServerLoginSheetController();
@@ -77,8 +78,10 @@ public:
   /// What the first begin has loaded; nothing before.
   const lumora::ServerLoginWindow& outlets() const { return outlets_; }
 
+  /// The title of the button that logs in; nothing: "Connect" in the user's language.
   std::optional<std::string> defaultButtonTitle() const { return defaultButtonTitle_; }
   void setDefaultButtonTitle(std::optional<std::string> title) { defaultButtonTitle_ = std::move(title); }
+  /// The title of the button that closes the sheet; nothing: "Cancel" in the user's language.
   std::optional<std::string> alternateButtonTitle() const { return alternateButtonTitle_; }
   void setAlternateButtonTitle(std::optional<std::string> title) { alternateButtonTitle_ = std::move(title); }
 

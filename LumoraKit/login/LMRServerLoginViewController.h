@@ -67,9 +67,11 @@ public:
   void attemptToLogInToServerWithTarget_selector(const std::shared_ptr<Target>& target, Selector selector) {
     attemptToLogIn(lumora::detail::actionMessage(target, selector));
   }
+  /// Ends the search for servers; those that are listed stay.
   void stopBrowsingForServers();
   /// Gives the keyboard to the server field.
   void populateDefaultServerChoice() const;
+  /// Forgets the session of an earlier login.
   void clearLoginSession() { setLoginSession(nullptr); }
 
   /// The width of the view, and the height that its visible controls need: 26.0 without the password controls, 80.0
@@ -80,13 +82,15 @@ public:
   /// Tells when currentLoginAction(), its isRunning(), server(), userName() or password() was set.
   [[nodiscard]] lumora::Connection observeAttemptButtonEnabled(std::function<void()> observer);
 
-  /// Whether both the application and the server take it. False while the server has not been asked.
+  /// Whether both the application and the server take single sign-on. False while the server has not been asked.
   bool singleSignOnAuthenticationAvailable() const;
+  /// Whether both the application and the server take passwords. False while the server has not been asked.
   bool passwordAuthenticationAvailable() const;
 
   /// The user name, the password and the check box with their labels. Hiding them clears user name and password;
   /// showing them fills in what is remembered. Nothing happens when they already are.
   void setPasswordControlsHidden(bool hidden);
+  /// Whether they are hidden.
   bool passwordControlsHidden() const;
 
   /// Whether it is known what the server of the field accepts. Ends the editing of the server field.
@@ -101,7 +105,9 @@ public:
   void setServerName(const void* sender);
   void comboBoxSelectionDidChange(const std::shared_ptr<KTServiceComboBox>& comboBox) override;
   void controlTextDidChange(const std::shared_ptr<lumora::TextField>& field) override;
+  /// The chosen service has an address: the server is asked what it is.
   void netServiceDidResolveAddress(const std::shared_ptr<lumora::NetService>& service) override;
+  /// The chosen service could not be resolved in time.
   void netService_didNotResolve(const std::shared_ptr<lumora::NetService>& service, const LMRErrorRef& error) override;
 
   // Properties. Observers are told of every set, also of one to an equal value, and read the value themselves.
@@ -113,12 +119,15 @@ public:
   std::uint16_t port() const { return port_; }
   void setPort(std::uint16_t port) { port_ = port; }
 
+  /// What stands in the user-name field; nothing when it is empty.
   std::optional<std::string> userName() const { return userName_.get(); }
   void setUserName(std::optional<std::string> userName) { userName_.set(std::move(userName)); }
+  /// Tells of every change of userName() until the connection ends.
   [[nodiscard]] lumora::Connection observeUserName(std::function<void()> observer);
   /// Overwritten in memory when it is replaced; a copy that the getter handed out is the caller's to wipe.
   std::optional<std::string> password() const;
   void setPassword(std::optional<std::string> password);
+  /// Tells of every change of password() until the connection ends.
   [[nodiscard]] lumora::Connection observePassword(std::function<void()> observer);
 
   /// The host name that a resolved discovered server published.
@@ -135,6 +144,7 @@ public:
   /// which is false when there was none.
   bool rememberPasswordInKeychain() const { return rememberPasswordInKeychain_.get(); }
   void setRememberPasswordInKeychain(bool remember) { rememberPasswordInKeychain_.set(remember); }
+  /// Tells of every change of the check box until the connection ends.
   [[nodiscard]] lumora::Connection observeRememberPasswordInKeychain(std::function<void()> observer);
   /// A shared station: stored passwords are neither read nor written, and no check box offers it. False unless set.
   bool isKioskMode() const { return isKioskMode_; }

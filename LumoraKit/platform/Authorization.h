@@ -7,6 +7,7 @@ namespace lumora {
 /// A permission for one privileged operation, as the helper agent handed it to the application. Opaque to the
 /// framework.
 struct Authorization {
+  /// As the agent made them; good for one connection of one process only.
   Data bytes;
 };
 

@@ -13,6 +13,7 @@ using WallTime = std::chrono::system_clock::time_point;
 class LUMORA_EXPORT WallClock {
 public:
   virtual ~WallClock();
+  /// The present moment. It may jump when the clock is set.
   virtual WallTime now() const = 0;
 };
 

@@ -45,6 +45,7 @@ struct LUMORA_EXPORT CredentialItem {
   std::string handle;
   /// Why account and secret could not be read; null when they were.
   LMRErrorRef error = nullptr;
+  /// The account that the item belongs to; empty when it could not be read.
   std::string account = {};
   /// Any bytes.
   Secret secret = Secret(std::string());

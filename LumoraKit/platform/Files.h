@@ -21,6 +21,7 @@ public:
   /// The current user's folders for application data, the preferred one first; they need not exist. Empty when there
   /// are none.
   virtual std::vector<std::filesystem::path> applicationSupportDirectories() = 0;
+  /// Whether a folder is there.
   virtual bool isDirectory(const std::filesystem::path& path) = 0;
   /// Whether a file of whatever kind that is not a folder is there.
   virtual bool isFile(const std::filesystem::path& path) = 0;

@@ -96,12 +96,14 @@ public:
   void setFinishTarget_selector(const std::shared_ptr<Target>& target, Selector selector) {
     setFinishMessage(lumora::detail::actionMessage(target, selector));
   }
+  /// The same for the action's failure: `selector` is called with the action, whose error() is set.
   template <class Target, class Selector>
   void setErrorTarget_selector(const std::shared_ptr<Target>& target, Selector selector) {
     setErrorMessage(lumora::detail::actionMessage(target, selector));
   }
-  /// Clears the target: nobody is told of that outcome.
+  /// Clears the target: nobody is told of the success.
   void setFinishTarget(std::nullptr_t);
+  /// Clears the target of the failure.
   void setErrorTarget(std::nullptr_t);
 
   /// Null while the action has not failed. Any thread.

@@ -9,9 +9,12 @@ class LUMORA_EXPORT KTHost {
 public:
   /// This machine, under its own host name.
   static KTHost currentHost();
+  /// A host by its name; nothing is looked up.
   static KTHost hostWithName(std::string name);
 
+  /// The host name, as it was given.
   const std::string& name() const { return name_; }
+  /// Whether it was made by currentHost(). A host by name never is.
   bool isCurrentHost() const { return isCurrentHost_; }
 
 private:

@@ -31,6 +31,7 @@ public:
   /// The type of service that is browsed for.
   static constexpr std::string_view serviceType = "_lumora._tcp";
 
+  /// A field around the toolkit's combo box, which must be there.
   explicit KTServiceComboBox(std::shared_ptr<lumora::ComboBox> comboBox);
   ~KTServiceComboBox() override;
 
@@ -48,6 +49,7 @@ public:
   /// What to do when the user has finished with the field.
   void setAction(std::function<void()> action) { action_ = std::move(action); }
 
+  /// The frame of the toolkit's combo box.
   lumora::Rect frame() const override;
   void setFrame(const lumora::Rect& frame) override;
   bool isHidden() const override;

@@ -31,6 +31,7 @@ public:
   virtual ~Archivable();
   /// The name under which the class is found again when it is decoded.
   virtual std::string className() const = 0;
+  /// Encodes what the object is made again from, under keys of its own class.
   virtual void encodeWithCoder(KeyedArchiver& coder) const = 0;
 };
 
@@ -43,6 +44,7 @@ public:
 
   /// A key encoded twice keeps the last value.
   void encode(std::string_view key, Value value);
+  /// Encodes an array of objects, each with the name of its class.
   void encodeObjects(std::string_view key, const std::vector<std::shared_ptr<const Archivable>>& objects);
 
 private:
@@ -55,6 +57,7 @@ class LUMORA_EXPORT KeyedUnarchiver {
 public:
   /// Makes an object of a class from its keys; null when it cannot.
   using Factory = std::function<std::shared_ptr<Archivable>(KeyedUnarchiver& coder)>;
+  /// The factory of each class, by Archivable::className().
   using ClassTable = std::map<std::string, Factory, std::less<>>;
 
   /// The object in an archive. Null, with the error set, when the text is no archive or names an unknown class; null

@@ -26,6 +26,7 @@ using LMRErrorRef = std::shared_ptr<const LMRError>;
 /// An immutable error value: a domain, a signed code and user information. Any thread.
 class LUMORA_EXPORT LMRError {
 public:
+  /// An error; the text for the user is in `userInfo` under LMRLocalizedDescriptionKey.
   LMRError(std::string domain, std::int64_t code, lumora::Dictionary userInfo);
 
   /// An error whose user information holds the localised description only.
@@ -33,10 +34,13 @@ public:
   /// An error in the POSIX domain: `what` and the text of `errorNumber`.
   static LMRErrorRef fromErrno(int errorNumber, std::string_view what);
 
+  /// Who gave the code its meaning ("org.vantor.Lumora").
   const std::string& domain() const { return domain_; }
+  /// What went wrong, in the words of the domain.
   std::int64_t code() const { return code_; }
   /// The text for the user; without one, "Error <code> in <domain>".
   std::string localizedDescription() const;
+  /// Everything else that is known of the error, such as a tool's own words under "stderr".
   const lumora::Dictionary& userInfo() const { return userInfo_; }
   /// The text that "%@" prints, for the log: domain, code and description.
   std::string description() const;

@@ -63,9 +63,11 @@ enum class CaptureErrorCode : std::int64_t {
 class LUMORA_EXPORT CaptureDevice {
 public:
   virtual ~CaptureDevice();
+  /// The identifier, by which deviceWithUniqueID() finds the device again.
   virtual std::string uniqueID() const = 0;
   /// For the user, in the user's language where the system knows it.
   virtual std::string localizedDisplayName() const = 0;
+  /// Whether the device delivers that type.
   virtual bool hasMediaType(MediaType type) const = 0;
   /// Makes the device ready for an input. Blocks for 5 seconds at most; null on success.
   virtual LMRErrorRef open() = 0;
@@ -75,6 +77,7 @@ public:
 class LUMORA_EXPORT CaptureConnection {
 public:
   virtual ~CaptureConnection();
+  /// Sound or video.
   virtual MediaType mediaType() const = 0;
   /// A disabled connection delivers no samples and has no track in a recording.
   virtual bool isEnabled() const = 0;
@@ -85,6 +88,7 @@ public:
 class LUMORA_EXPORT CaptureInput {
 public:
   virtual ~CaptureInput();
+  /// The streams of the input, in an order that stays.
   virtual std::vector<std::shared_ptr<CaptureConnection>> connections() const = 0;
   /// The device behind a device input; null for the screen.
   virtual std::shared_ptr<CaptureDevice> device() const = 0;
@@ -96,8 +100,9 @@ struct CompressionOptions {
   std::optional<std::string> codec;
   /// Bits per second.
   std::optional<std::uint32_t> bitRate;
-  /// Video only, in pixels: both or none.
+  /// Video only, the width in pixels: with a height, or neither.
   std::optional<std::uint32_t> width;
+  /// Video only, the height in pixels: with a width, or neither.
   std::optional<std::uint32_t> height;
 
   friend bool operator==(const CompressionOptions&, const CompressionOptions&) = default;
@@ -130,24 +135,32 @@ class MovieFileOutput;
 /// message.
 class LUMORA_EXPORT MovieFileOutputDelegate {
 public:
+  /// The connections that a message is about: those with a track in the file.
   using Connections = std::vector<std::shared_ptr<CaptureConnection>>;
 
   virtual ~MovieFileOutputDelegate();
+  /// The file exists and its recording has begun.
   virtual void
   captureOutput_didStartRecordingToOutputFileAtURL_forConnections(const std::shared_ptr<MovieFileOutput>& output,
                                                                   const std::filesystem::path& file,
                                                                   const Connections& connections) = 0;
+  /// The recording is paused: nothing is written until it is resumed.
   virtual void
   captureOutput_didPauseRecordingToOutputFileAtURL_forConnections(const std::shared_ptr<MovieFileOutput>& output,
                                                                   const std::filesystem::path& file,
                                                                   const Connections& connections) = 0;
+  /// The recording goes on.
   virtual void
   captureOutput_didResumeRecordingToOutputFileAtURL_forConnections(const std::shared_ptr<MovieFileOutput>& output,
                                                                    const std::filesystem::path& file,
                                                                    const Connections& connections) = 0;
+  /// The last sample is in the file, which is being completed. The error says why the recording ended by itself; null
+  /// when it was asked to.
   virtual void captureOutput_willFinishRecordingToOutputFileAtURL_forConnections_dueToError(
       const std::shared_ptr<MovieFileOutput>& output, const std::filesystem::path& file, const Connections& connections,
       const LMRErrorRef& error) = 0;
+  /// The file is complete, or writing it was given up; the output takes the next one. A recording that never began is
+  /// told of here only, with the error.
   virtual void captureOutput_didFinishRecordingToOutputFileAtURL_forConnections_dueToError(
       const std::shared_ptr<MovieFileOutput>& output, const std::filesystem::path& file, const Connections& connections,
       const LMRErrorRef& error) = 0;
@@ -176,14 +189,18 @@ public:
   /// Begins to write that file, or, without one, finishes the current file. Asked for the file that it is writing or
   /// finishing, it goes on with that as if it had not been asked: nothing is written over a recording.
   virtual void recordToOutputFileURL(const std::optional<std::filesystem::path>& file) = 0;
+  /// Pauses the recording: now, or at the sample whose message this is called in. Without a recording nothing happens.
   virtual void pauseRecording() = 0;
+  /// Goes on with a paused recording: now, or at the sample whose message this is called in.
   virtual void resumeRecording() = 0;
-  /// The same three for a moment of the host clock that has just been, for use inside the message of the first sample
+  /// The same for a moment of the host clock that has just been, for use inside the message of the first sample
   /// after it: the file begins, is paused and goes on at the moment, not at the sample. Outputs that are asked for the
   /// same moments so keep the same time, however their devices' samples lie. Without a definition of its own an output
   /// takes them for the plain requests.
   virtual void recordToOutputFileURL_atHostTime(const std::filesystem::path& file, HostTime time);
+  /// As recordToOutputFileURL_atHostTime(), for a pause.
   virtual void pauseRecordingAtHostTime(HostTime time);
+  /// As recordToOutputFileURL_atHostTime(), for the end of a pause.
   virtual void resumeRecordingAtHostTime(HostTime time);
   /// The file being written; nothing when none is.
   virtual std::optional<std::filesystem::path> outputFileURL() const = 0;
@@ -196,11 +213,16 @@ public:
 class LUMORA_EXPORT CaptureSession {
 public:
   virtual ~CaptureSession();
-  /// Null on success.
+  /// Adds an input of this capture system to a session that does not run; null on success.
   virtual LMRErrorRef addInput(const std::shared_ptr<CaptureInput>& input) = 0;
+  /// Adds an output with the connections of all inputs; null on success. An output is in one session only, else the
+  /// error is NotPossible.
   virtual LMRErrorRef addOutput(const std::shared_ptr<MovieFileOutput>& output) = 0;
+  /// Takes an output out. The file that it writes is finished.
   virtual void removeOutput(const std::shared_ptr<MovieFileOutput>& output) = 0;
+  /// The inputs in the order of their addition.
   virtual std::vector<std::shared_ptr<CaptureInput>> inputs() const = 0;
+  /// The outputs in the order of their addition.
   virtual std::vector<std::shared_ptr<MovieFileOutput>> outputs() const = 0;
 
   /// Starts every device and waits for the first sample of each enabled connection. Blocks for 5 seconds at most.
@@ -214,6 +236,7 @@ public:
   /// not running. Returns once the devices have stopped; when called from inside a message to an output's delegate (a
   /// recorder may die there) it returns at once, and they stop afterwards.
   virtual void stopRunning() = 0;
+  /// Whether startRunning() has succeeded and nobody has stopped the session since.
   virtual bool isRunning() const = 0;
 };
 
@@ -222,16 +245,21 @@ class LUMORA_EXPORT MediaCapture {
 public:
   virtual ~MediaCapture();
 
-  /// Null when there is none.
+  /// The device of that type that the system prefers; null when there is none.
   virtual std::shared_ptr<CaptureDevice> defaultInputDevice(MediaType type) = 0;
+  /// All devices of that type, in an order of the system's.
   virtual std::vector<std::shared_ptr<CaptureDevice>> inputDevices(MediaType type) = 0;
+  /// The device with that identifier; null when it is not there.
   virtual std::shared_ptr<CaptureDevice> deviceWithUniqueID(const std::string& uniqueID) = 0;
 
+  /// An input with a connection for each stream of the device.
   virtual std::shared_ptr<CaptureInput> makeDeviceInput(const std::shared_ptr<CaptureDevice>& device) = 0;
   /// An input that captures the main screen: of the X server or, on a Wayland desktop, the one that the user chooses.
   /// The answer holds for the life of the application where the desktop can remember it.
   virtual std::shared_ptr<CaptureInput> makeScreenInput() = 0;
+  /// A session without inputs and outputs, which does not run.
   virtual std::shared_ptr<CaptureSession> makeSession() = 0;
+  /// An output that is in no session yet.
   virtual std::shared_ptr<MovieFileOutput> makeMovieFileOutput() = 0;
 
   /// The host clock now.

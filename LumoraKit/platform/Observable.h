@@ -20,7 +20,9 @@ struct Observer;
 /// the connection may die in any order, also from inside a notice.
 class LUMORA_EXPORT Connection {
 public:
+  /// A connection to nothing.
   Connection();
+  /// For those that hand out connections.
   Connection(std::weak_ptr<detail::Observers> observers, std::shared_ptr<detail::Observer> observer);
   Connection(Connection&& other) noexcept;
   Connection& operator=(Connection&& other) noexcept;
@@ -43,7 +45,9 @@ public:
   Notifier& operator=(const Notifier&) = delete;
   ~Notifier();
 
+  /// Calls the observer at each notice until the connection ends.
   [[nodiscard]] Connection observe(std::function<void()> observer);
+  /// Calls the observers, in the order in which they came, on this thread, and returns after the last.
   void notify();
 
 private:
@@ -53,16 +57,21 @@ private:
 /// A value that tells of every set, also of one to an equal value, and on touch(). One thread at a time.
 template <class T> class Observable {
 public:
+  /// A value made from nothing.
   Observable() = default;
+  /// Holds the value; there is nobody to tell yet.
   explicit Observable(T value) : value_(std::move(value)) {}
 
+  /// The value. The reference is good until the next set().
   const T& get() const { return value_; }
+  /// Sets the value and tells the observers, also when it is equal.
   void set(T value) {
     value_ = std::move(value);
     notifier_.notify();
   }
   /// Tells the observers although nothing was set.
   void touch() { notifier_.notify(); }
+  /// Calls the observer after each set() until the connection ends.
   [[nodiscard]] Connection observe(std::function<void()> observer) { return notifier_.observe(std::move(observer)); }
 
 private:

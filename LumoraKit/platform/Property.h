@@ -9,14 +9,18 @@ namespace lumora {
 /// written value. Any thread. (std::atomic<std::shared_ptr> of GCC 12 hides its lock from ThreadSanitizer.)
 template <class T> class Property {
 public:
+  /// A value made from nothing.
   Property() = default;
+  /// Holds the value.
   explicit Property(T value) : value_(std::move(value)) {}
 
+  /// A copy of the value. Any thread.
   T get() const {
     const std::lock_guard lock(mutex_);
     return value_;
   }
 
+  /// Replaces the value. Any thread; the old one is destroyed without the lock.
   void set(T value) {
     {
       const std::lock_guard lock(mutex_);

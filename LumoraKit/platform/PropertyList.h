@@ -33,6 +33,7 @@ LUMORA_EXPORT std::optional<Value> valueWithXMLDescription(std::string_view text
 
 /// The same for a text whose root must be a dictionary.
 LUMORA_EXPORT std::optional<Dictionary> dictionaryWithXMLDescription(std::string_view text);
+/// The same, with the reason when it cannot be read.
 LUMORA_EXPORT std::optional<Dictionary> dictionaryWithXMLDescription_error(std::string_view text, LMRErrorRef* error);
 
 } // namespace lumora

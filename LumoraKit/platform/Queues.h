@@ -13,6 +13,7 @@ namespace lumora {
 class LUMORA_EXPORT WorkQueue {
 public:
   virtual ~WorkQueue();
+  /// The name that it was made with, for the log and the debugger.
   virtual const std::string& label() const = 0;
   /// Returns at once.
   virtual void async(Task task) = 0;

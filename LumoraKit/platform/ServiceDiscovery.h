@@ -30,7 +30,9 @@ LUMORA_EXPORT TextRecord textRecordWithStrings(const std::vector<std::string>& s
 class LUMORA_EXPORT NetServiceDelegate {
 public:
   virtual ~NetServiceDelegate();
+  /// The service's address and text record are known.
   virtual void netServiceDidResolveAddress(const std::shared_ptr<NetService>& service) = 0;
+  /// They could not be found out, or not within the limit; the error says why.
   virtual void netService_didNotResolve(const std::shared_ptr<NetService>& service, const LMRErrorRef& error) = 0;
 };
 
@@ -53,7 +55,9 @@ public:
 
 /// What a browser tells of.
 struct LUMORA_EXPORT ServiceBrowserEvents {
+  /// A service came, or was there already.
   std::function<void(const std::shared_ptr<NetService>& service)> found;
+  /// A service went; the object is the one that was told as found.
   std::function<void(const std::shared_ptr<NetService>& service)> lost;
 };
 

@@ -19,17 +19,25 @@ class LMRServerLoginViewController;
 
 namespace lumora {
 
+/// A width and a height, in device-independent units.
 struct Size {
+  /// To the right.
   double width = 0;
+  /// Upwards.
   double height = 0;
 
   bool operator==(const Size&) const = default;
 };
 
+/// A place and a size, in device-independent units.
 struct Rect {
+  /// Of the lower left corner, to the right of the container's.
   double x = 0;
+  /// Of the lower left corner, above the container's.
   double y = 0;
+  /// To the right of the corner.
   double width = 0;
+  /// Upwards from the corner.
   double height = 0;
 
   bool operator==(const Rect&) const = default;
@@ -43,6 +51,7 @@ public:
   View& operator=(const View&) = delete;
   virtual ~View();
 
+  /// Where it lies in what contains it.
   virtual Rect frame() const = 0;
   virtual void setFrame(const Rect& frame) = 0;
   /// Whether the view itself was hidden, wherever it lies.
@@ -50,6 +59,7 @@ public:
   virtual void setHidden(bool hidden) = 0;
 };
 
+/// A line of text that the user may edit, or that is only shown.
 class LUMORA_EXPORT TextField : public View {
 public:
   TextField();
@@ -71,27 +81,34 @@ public:
   ComboBox();
   ~ComboBox() override;
 
+  /// Appends an entry to the list.
   virtual void addItem(const std::string& item) = 0;
+  /// Removes an entry of that text from the list.
   virtual void removeItem(const std::string& item) = 0;
 };
 
+/// A button that is pressed.
 class LUMORA_EXPORT Button : public View {
 public:
   Button();
   ~Button() override;
 
+  /// Sets its text, in the user's language.
   virtual void setTitle(const std::string& title) = 0;
   /// Makes the frame as wide as the title needs; the rest of the frame stays.
   virtual void sizeToFit() = 0;
 };
 
+/// A picture that the toolkit brings.
 enum class SystemImage { Caution };
 
+/// A picture.
 class LUMORA_EXPORT ImageView : public View {
 public:
   ImageView();
   ~ImageView() override;
 
+  /// Shows the toolkit's picture of that meaning.
   virtual void setImage(SystemImage image) = 0;
 };
 
@@ -115,6 +132,7 @@ public:
   virtual void setSubview(const std::shared_ptr<View>& view) = 0;
 };
 
+/// A window with a title bar, or a sheet.
 class LUMORA_EXPORT Window {
 public:
   /// Receives the return code.
@@ -127,6 +145,7 @@ public:
 
   /// With the title bar, if there is one.
   virtual Rect frame() const = 0;
+  /// Moves and resizes it. `display`: it is drawn at once. `animate`: it gets there visibly, where the toolkit can.
   virtual void setFrame_display_animate(const Rect& frame, bool display, bool animate) = 0;
   /// Whether it is shown as a sheet at this moment.
   virtual bool isSheet() const = 0;
@@ -144,15 +163,25 @@ public:
 /// - text that the user changes in `userNameTextField` is then reported to the owner's controlTextDidChange();
 /// - the action of `serverComboBox` is the owner's setServerName().
 struct LUMORA_EXPORT ServerLoginView {
+  /// The whole panel.
   std::shared_ptr<View> view;
+  /// Where a server is typed or chosen.
   std::shared_ptr<KTServiceComboBox> serverComboBox;
+  /// The label beside the user name.
   std::shared_ptr<View> userNameLabelTextField;
+  /// Where the user name is typed.
   std::shared_ptr<TextField> userNameTextField;
+  /// The label beside the password.
   std::shared_ptr<View> passwordLabelTextField;
+  /// Where the password is typed; it is not shown.
   std::shared_ptr<TextField> passwordTextField;
+  /// The check box that remembers the password.
   std::shared_ptr<View> rememberPasswordInKeychainButton;
+  /// Marks the server field as empty.
   std::shared_ptr<View> serverRequiredImageView;
+  /// Marks the user name as empty.
   std::shared_ptr<View> userNameRequiredImageView;
+  /// Marks the password as empty.
   std::shared_ptr<View> passwordRequiredImageView;
 };
 
@@ -163,12 +192,19 @@ struct LUMORA_EXPORT ServerLoginView {
 ///   and of the Escape key cancelClicked();
 /// - `defaultButton` is enabled as the panel's `attemptButtonEnabled` says.
 struct LUMORA_EXPORT ServerLoginWindow {
+  /// The sheet itself.
   std::shared_ptr<Window> window;
+  /// Where the panel goes.
   std::shared_ptr<ContainerView> serverLoginView;
+  /// The page of the progress, of the error, and the blank one.
   std::shared_ptr<TabView> progressAndErrorTabView;
+  /// The picture beside an error.
   std::shared_ptr<ImageView> alertImageView;
+  /// The text of the error.
   std::shared_ptr<View> errorTextField;
+  /// The button that logs in.
   std::shared_ptr<Button> defaultButton;
+  /// The button that closes the sheet.
   std::shared_ptr<Button> alternateButton;
 };
 

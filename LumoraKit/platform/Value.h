@@ -33,9 +33,12 @@ using Date = std::chrono::sys_seconds;
 /// A property-list dictionary: string keys, each once, in the order of their first insertion.
 class LUMORA_EXPORT Dictionary {
 public:
+  /// A key and its value.
   using Entry = std::pair<std::string, Value>;
 
+  /// An empty dictionary.
   Dictionary();
+  /// The entries, in their order.
   Dictionary(std::initializer_list<Entry> entries);
   Dictionary(const Dictionary& other);
   Dictionary(Dictionary&& other) noexcept;
@@ -46,20 +49,26 @@ public:
   /// A dictionary of entries in which a repeated key keeps the place of its first and the value of its last entry.
   static Dictionary fromEntries(std::vector<Entry> entries);
 
+  /// Whether there is no entry.
   bool empty() const;
+  /// The number of entries.
   std::size_t size() const;
+  /// The first entry; entries are visited in their order.
   std::vector<Entry>::const_iterator begin() const;
+  /// Behind the last entry.
   std::vector<Entry>::const_iterator end() const;
 
   /// The value of a key, or null.
   const Value* find(std::string_view key) const;
   Value* find(std::string_view key);
+  /// Whether the key is there.
   bool contains(std::string_view key) const;
 
   /// The string under a key; nothing when the key is absent or its value is not a string.
   std::optional<std::string> string(std::string_view key) const;
-  /// The dictionary or array under a key, or null when absent or of another type.
+  /// The dictionary under a key, or null when absent or of another type.
   const Dictionary* dictionary(std::string_view key) const;
+  /// The array under a key, or null when absent or of another type.
   const Array* array(std::string_view key) const;
 
   /// Replaces the value of a key in its place, or appends the pair.
@@ -81,9 +90,10 @@ private:
 /// were made from.
 class LUMORA_EXPORT Value {
 public:
+  /// What a value holds.
   enum class Type { String, Integer, UnsignedInteger, Real, Boolean, Date, Data, Array, Dictionary };
 
-  // Implicit, so that a literal can stand wherever a value is asked for.
+  /// A value that holds this. Implicit, so that a literal can stand wherever a value is asked for.
   Value(std::string text);
   Value(std::string_view text);
   Value(const char* text);
@@ -104,22 +114,31 @@ public:
   Value& operator=(Value&& other) noexcept;
   ~Value();
 
+  /// What it holds. An integer that fits std::int64_t is an Integer, whatever it was made from.
   Type type() const;
 
-  /// The content when the value is of that type, else null. The pointer lives as long as the value is unchanged.
+  /// The text when the value is one, else null. The pointer lives as long as the value is unchanged.
   const std::string* string() const;
+  /// The bytes when the value is data, else null. The pointer lives as long as the value is unchanged.
   const Data* data() const;
+  /// The elements when the value is an array, else null. The pointer lives as long as the value is unchanged.
   const Array* array() const;
+  /// The entries when the value is a dictionary, else null. The pointer lives as long as the value is unchanged.
   const Dictionary* dictionary() const;
+  /// The same, to change it.
   std::string* string();
+  /// The elements, to change them.
   Array* array();
+  /// The entries, to change them.
   Dictionary* dictionary();
 
-  /// The content when the value is of that type, else nothing.
+  /// The truth value when the value is a boolean, else nothing.
   std::optional<bool> boolean() const;
+  /// The moment when the value is a date, else nothing.
   std::optional<Date> date() const;
-  /// A number that fits, from an integer of either sign or a boolean (0 or 1); nothing for everything else.
+  /// A number that fits, from an integer or a boolean (0 or 1); nothing for everything else.
   std::optional<std::int64_t> integer() const;
+  /// The same for a number that is not negative.
   std::optional<std::uint64_t> unsignedInteger() const;
   /// Any number, an integer and a boolean included, as a real; nothing for everything else.
   std::optional<double> real() const;

@@ -8,6 +8,7 @@
 /// Finding capture devices. Any thread.
 namespace LMRCaptureDeviceAdditions {
 
+/// Devices in the order in which the system lists them.
 using Devices = std::vector<std::shared_ptr<lumora::CaptureDevice>>;
 
 /// The default device for sound, without one the default muxed device, else null.

@@ -10,7 +10,9 @@
 /// capture system are passed on as they are. Any thread. Block while devices are opened.
 namespace LMRCaptureSessionAdditions {
 
+/// A session that does not run yet; null when it could not be built.
 using Session = std::shared_ptr<lumora::CaptureSession>;
+/// A device to be opened; null where a function takes none.
 using Device = std::shared_ptr<lumora::CaptureDevice>;
 
 /// A microphone and a camera, which may be one device. A muxed device that is only one of the two gives only its own

@@ -18,6 +18,7 @@ inline constexpr std::string_view LMRDiskSpaceIsLowNotification = "LMRDiskSpaceI
 
 /// The room that there is for recordings in a folder, and how fast they will use it up.
 struct LUMORA_EXPORT LMRDiskSpace {
+  /// The folder that the recordings are written to.
   std::filesystem::path folder;
   /// What the user may still write there.
   std::uint64_t availableBytes = 0;
@@ -27,6 +28,7 @@ struct LUMORA_EXPORT LMRDiskSpace {
   /// Below it the room is low.
   std::uint64_t lowWaterMark = 0;
 
+  /// Whether less room is left than the mark.
   bool isLow() const { return availableBytes < lowWaterMark; }
   /// How long can be recorded until the room is low; infinite when nothing is recorded there.
   double secondsLeft() const;
@@ -46,7 +48,7 @@ struct LUMORA_EXPORT LMRDiskSpace {
 ///     recorder->bootstrap();
 ///     for (const LMRDiskSpace& space : watch->forecast()) { ... }      // space.secondsLeft()
 ///     lowSpace_ = lumora::Platform::current().notificationCenter->observe(
-///         LMRDiskSpaceIsLowNotification, [](const std::any& object) {
+///         LMRDiskSpaceIsLowNotification, [this](const std::any& object) {
 ///           const auto& space = std::any_cast<const LMRDiskSpace&>(object);
 ///           ...                                                        // warn the user, or stop
 ///         });

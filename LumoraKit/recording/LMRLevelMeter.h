@@ -11,7 +11,7 @@
 ///
 ///     LMRErrorRef error;
 ///     auto meter = LMRLevelMeter::meterWithCaptureSession_error(session, &error);
-///     ... twenty times a second:
+///     ...                                                           // twenty times a second
 ///     for (const lumora::SoundLevel& level : meter->takeLevels()) { bar->set(LMRLevelMeter::decibels(level.peak)); }
 ///     warning->setVisible(meter->secondsOfSilence() > 10);
 ///

@@ -29,8 +29,9 @@ public:
   /// Begins the file on the next turn of the queue that the caller runs on; on a worker when it runs on none. The delay
   /// is ignored. The recorder lives at least until then. Any thread.
   void startWithDelay(double delay) override;
-  /// Pauses or resumes the file at once. Any thread.
+  /// Pauses the file at once. Any thread.
   void pause() override;
+  /// Goes on with the paused file at once. Any thread.
   void resume() override;
 
 protected:

@@ -28,7 +28,7 @@ class LUMORA_EXPORT LMRLocalVideoRecorder : public LMRSourceRecorder,
                                             public lumora::Archivable,
                                             public lumora::MovieFileOutputDelegate {
 protected:
-  // Makes the constructor callable by the factories of this class and its subclasses only.
+  /// Makes the constructor callable by the factories of this class and its subclasses only.
   struct MadeByFactory {
     explicit MadeByFactory() = default;
   };
@@ -55,6 +55,7 @@ public:
   void setAudioCompressionOptions(const std::optional<lumora::CompressionOptions>& options) {
     audioCompressionOptions_.set(options);
   }
+  /// How the pictures are encoded; applied by bootstrap(). Absent: the framework's choice.
   std::optional<lumora::CompressionOptions> videoCompressionOptions() const { return videoCompressionOptions_.get(); }
   void setVideoCompressionOptions(const std::optional<lumora::CompressionOptions>& options) {
     videoCompressionOptions_.set(options);
@@ -64,8 +65,9 @@ public:
   std::optional<std::filesystem::path> outputFileURL() const { return outputFileURL_.get(); }
   void setOutputFileURL(std::optional<std::filesystem::path> file) { outputFileURL_.set(std::move(file)); }
 
-  /// When the output reported that the recording started, and that it finished.
+  /// When the output reported that the recording started; nothing before.
   std::optional<lumora::WallTime> recordingStartDate() const { return recordingStartDate_.get(); }
+  /// When the output reported that the file is finished; nothing before.
   std::optional<lumora::WallTime> recordingStopDate() const { return recordingStopDate_.get(); }
 
   /// The moments at which the file began, was paused, went on, was paused and so on: its time is the host's from the
@@ -83,9 +85,11 @@ public:
   bool isSubmitted() const { return isSubmitted_; }
   void setIsSubmitted(bool isSubmitted) { isSubmitted_ = isSubmitted; }
 
-  /// The pending requests; nothing when none is.
+  /// The host time of the pending request to start; nothing when none is pending.
   std::optional<lumora::HostTime> hostTimeToStart() const { return hostTimeToStart_.get(); }
+  /// The host time of the pending request to pause; nothing when none is pending.
   std::optional<lumora::HostTime> hostTimeToPause() const { return hostTimeToPause_.get(); }
+  /// The host time of the pending request to resume; nothing when none is pending.
   std::optional<lumora::HostTime> hostTimeToResume() const { return hostTimeToResume_.get(); }
 
   /// Adds the output to the session and chooses the file: a new UUID with ".mov" in the application-support folder,
@@ -94,8 +98,9 @@ public:
   void bootstrap() override;
   /// Starts the file at the first sample that is captured after now. The delay is ignored. Any thread.
   void startWithDelay(double delay) override;
-  /// Pauses or resumes the file at the first sample that is captured from now on. Any thread.
+  /// Pauses the file at the first sample that is captured from now on. Any thread.
   void pause() override;
+  /// Goes on with the paused file at the first sample that is captured from now on. Any thread.
   void resume() override;
   /// Finishes the file. Fails at once, without an error, when none is being written. Any thread.
   void stop() override;
@@ -125,6 +130,7 @@ public:
                                                           lumora::CaptureConnection& connection) override;
 
 protected:
+  /// A recorder of the wanted class for a session.
   template <class Recorder>
   static std::shared_ptr<Recorder> makeWithCaptureSession(const std::shared_ptr<lumora::CaptureSession>& session) {
     auto recorder = std::make_shared<Recorder>(MadeByFactory());
@@ -132,6 +138,7 @@ protected:
     recorder->commonInit();
     return recorder;
   }
+  /// A recorder of the wanted class for the archived devices; null when its session cannot be built.
   template <class Recorder> static std::shared_ptr<Recorder> makeWithCoder(const lumora::KeyedUnarchiver& coder) {
     auto recorder = std::make_shared<Recorder>(MadeByFactory());
     LMRLocalVideoRecorder& decoded = *recorder;
@@ -143,15 +150,18 @@ protected:
   /// Rebuilds the session of a new recorder; false when it cannot.
   virtual bool decodeWithCoder(const lumora::KeyedUnarchiver& coder);
 
+  /// How a session of sound alone, or of sound and one more input, is built.
   using SessionOfAudioDevice = std::shared_ptr<lumora::CaptureSession> (*)(
       const std::shared_ptr<lumora::CaptureDevice>& audioDevice, LMRErrorRef* error);
   /// For a decoding subclass: puts the session of the archived microphone in the place of the one with a camera. The
   /// output stays. False, with a log line when there is an error, when there is no such session.
   bool rebuildSession(const lumora::KeyedUnarchiver& coder, SessionOfAudioDevice makeSession);
 
-  /// Asks the output to begin, pause or go on with the file at that moment.
+  /// Asks the output to begin the file at that moment.
   void beginFile(lumora::HostTime time);
+  /// Asks the output to pause the file at that moment.
   void pauseFile(lumora::HostTime time);
+  /// Asks the output to go on with the file at that moment.
   void resumeFile(lumora::HostTime time);
 
 private:

@@ -21,6 +21,7 @@ inline constexpr std::string_view LMRMovieFileErrorDomain = "org.vantor.lumora.m
 /// index of its own. A file that ends in the midst of a fragment is whole up to that fragment. A value; it says what
 /// the file was when it was looked at.
 struct LUMORA_EXPORT LMRMovieFile {
+  /// What a file is, when it is looked at.
   enum class State {
     /// Whole to its end, and playable.
     Complete,
@@ -37,7 +38,9 @@ struct LUMORA_EXPORT LMRMovieFile {
   /// another way, and nothing that may yet be saved is cut off.
   static constexpr std::uint64_t mostLostBytes = 64'000'000;
 
+  /// The path that was given.
   std::filesystem::path file;
+  /// What it was when it was looked at, or has become by repair().
   State state = State::Missing;
   /// In bytes.
   std::uint64_t size = 0;
@@ -52,6 +55,7 @@ struct LUMORA_EXPORT LMRMovieFile {
   /// thread.
   static LMRMovieFile movieFileWithPath(const std::filesystem::path& file);
 
+  /// Whether it needs no repair.
   bool isPlayable() const { return state == State::Complete; }
   /// What a repair takes away, or took.
   std::uint64_t lostBytes() const { return usableSize == 0 ? 0 : size - usableSize; }

@@ -47,6 +47,7 @@ class LUMORA_EXPORT LMRMultipleSourceRecorder : public LMRSourceRecorder,
   };
 
 public:
+  /// Source recorders, in the order in which they were given.
   using Recorders = std::vector<Recorder>;
 
   /// A recorder of these sources, in this order. It becomes the delegate of each; the sources are not null.
@@ -97,8 +98,9 @@ public:
   /// Starts the sources. The delay, in seconds, is for the remote ones of a mix, which wait it out at the server; the
   /// local ones of a mix then start without one. Any thread; blocks for the remote sources of a mix.
   void startWithDelay(double delay) override;
-  /// Any thread; block for the remote sources of a mix.
+  /// Pauses every source. Any thread; blocks for the remote sources of a mix.
   void pause() override;
+  /// Goes on with every paused source. Any thread; blocks for the remote sources of a mix.
   void resume() override;
   /// Creates a recording container for the workflow, hands every source a submission UUID of it in the submission
   /// order, and stops all of them at once. Blocks for the creation. Fails when that does, with the sources still
@@ -118,6 +120,7 @@ public:
   /// Archives the sources, those that can be, and nothing else.
   void encodeWithCoder(lumora::KeyedArchiver& coder) const override;
 
+  /// @{
   /// What the sources report. Main thread only.
   void recorderDidStartRecording(const Recorder& recorder) override;
   void recorderFailedToStartRecording_error(const Recorder& recorder, const LMRErrorRef& error) override;
@@ -129,6 +132,7 @@ public:
   void recorderFailedToStopRecording_error(const Recorder& recorder, const LMRErrorRef& error) override;
   void recorderDidCancelRecording(const Recorder& recorder) override;
   void recorderFailedToCancelRecording_error(const Recorder& recorder, const LMRErrorRef& error) override;
+  /// @}
 
 private:
   using Request = std::function<void(LMRSourceRecorder& source)>;

@@ -23,6 +23,7 @@ struct LUMORA_EXPORT LMRNotedSource {
   /// Empty until the recording is stopped.
   std::string submissionUUID;
 
+  /// Whether its file is on this machine.
   bool isLocal() const { return !file.empty(); }
 };
 
@@ -31,6 +32,7 @@ struct LUMORA_EXPORT LMRNotedSource {
 struct LUMORA_EXPORT LMRRecordingNote {
   /// Given by the journal: a UUID.
   std::string identifier;
+  /// When it was noted.
   lumora::Date began;
 
   /// What it is recorded for; empty when that is not known yet.
@@ -41,8 +43,11 @@ struct LUMORA_EXPORT LMRRecordingNote {
   // Whose session it needs: server, port and user as in the session, the server empty when nobody has logged in.
   // Passwords are not kept.
 
+  /// The host name of the server.
   std::string server;
+  /// The port of the server; 0 is the default port.
   std::uint16_t port = LMRDefaultServerPort;
+  /// Empty with single sign-on.
   std::string userName;
 
   /// In the order in which they get a submission UUID.
@@ -57,6 +62,7 @@ struct LUMORA_EXPORT LMRRecordingNote {
 
   /// Whose session is needed to submit it.
   void setSession(const LMRSession& session);
+  /// Whether that session may submit it.
   bool isFor(const LMRSession& session) const;
   /// Whether every local source has its submission UUID.
   bool hasSubmissionUUIDs() const;

@@ -40,6 +40,7 @@ public:
   /// An idle recorder for the archived camera, without a session: its owner sets one, and where to submit to.
   static std::shared_ptr<LMRRemoteVideoRecorder> initWithCoder(const lumora::KeyedUnarchiver& coder);
 
+  /// A recorder for a camera that is bound to the server; see recorderWithRemoteRecorderName_session().
   LMRRemoteVideoRecorder(std::optional<std::string> remoteRecorderName, std::shared_ptr<LMRSession> session);
   ~LMRRemoteVideoRecorder() override;
 
@@ -49,6 +50,7 @@ public:
   std::optional<std::string> remoteRecorderName() const { return remoteRecorderName_.get(); }
   void setRemoteRecorderName(std::optional<std::string> name) { remoteRecorderName_.set(std::move(name)); }
 
+  /// The login session that every command is sent with.
   std::shared_ptr<LMRSession> session() const { return session_.get(); }
   void setSession(std::shared_ptr<LMRSession> session) { session_.set(std::move(session)); }
 
@@ -75,7 +77,9 @@ public:
   /// Has the server wait out the delay, of which whole seconds count, and start the camera. `delay` must not be
   /// negative. Blocks. Any thread, as the other requests.
   void startWithDelay(double delay) override;
+  /// Has the server pause the recording. Blocks.
   void pause() override;
+  /// Has the server go on with the paused recording. Blocks.
   void resume() override;
   /// Stops the camera and has the server submit what it recorded. Needs a submission UUID or a workflow, and a place
   /// for the metadata file (asserted by the action's factory).
@@ -83,7 +87,8 @@ public:
   /// Ends the recording and has the server throw it away.
   void cancel() override;
 
-  /// The ends of the commands, called with the finished action.
+  /// @{
+  /// The ends of the commands, called with the finished action: each reports the outcome to the delegate.
   void recordingStartedWithAction(const std::shared_ptr<LMRAction>& action);
   void failedToStartRecordingWithAction(const std::shared_ptr<LMRAction>& action);
   void pausedRecordingWithAction(const std::shared_ptr<LMRAction>& action);
@@ -94,11 +99,13 @@ public:
   void failedToStopRecordingWithAction(const std::shared_ptr<LMRAction>& action);
   void cancelledRecordingWithAction(const std::shared_ptr<LMRAction>& action);
   void failedToCancelRecordingWithAction(const std::shared_ptr<LMRAction>& action);
+  /// @}
 
   /// Archives the camera's name and nothing else.
   void encodeWithCoder(lumora::KeyedArchiver& coder) const override;
 
 protected:
+  /// The camera's name in an archive; nothing when it is not there.
   static std::optional<std::string> archivedName(const lumora::KeyedUnarchiver& coder);
   /// The start of this class and of its audio-only subclass.
   void startWithDelay_audioOnly(double delay, bool audioOnly);

@@ -60,8 +60,10 @@ public:
   ///     Cancelled  -         -         -         x
   bool isStarting() const { return isStarting_; }
   void setIsStarting(bool isStarting) { isStarting_ = isStarting; }
+  /// Whether it records at this moment; false while it is paused.
   bool isRecording() const { return isRecording_; }
   void setIsRecording(bool isRecording) { isRecording_ = isRecording; }
+  /// Whether a recording that has begun is paused.
   bool isPaused() const { return isPaused_; }
   void setIsPaused(bool isPaused) { isPaused_ = isPaused; }
   /// Never cleared again by the recorder itself.
@@ -83,27 +85,39 @@ public:
   virtual void bootstrap();
   /// The same as startWithDelay(0.0).
   void start();
-  /// The five requests, for every subclass to override: on this class itself they are programming errors (asserted).
-  /// `delay` is in seconds.
+  /// Begins the recording after `delay` seconds; the outcome is didStartRecording() or its failure. This and the next
+  /// four are for every subclass to override: on this class itself they are programming errors (asserted).
   virtual void startWithDelay(double delay);
+  /// Pauses the recording; the outcome is didPauseRecording() or its failure.
   virtual void pause();
+  /// Goes on with a paused recording; the outcome is didResumeRecording() or its failure.
   virtual void resume();
+  /// Ends the recording and keeps it; the outcome is didStopRecording() or its failure.
   virtual void stop();
+  /// Ends the recording and throws it away; the outcome is didCancelRecording() or its failure.
   virtual void cancel();
 
   /// The ten completion operations, for subclasses, when an outcome is known. Each writes a log line, sets the flags,
   /// updates the clock and tells the delegate, in any state. Any thread. Block until the delegate has handled the
   /// message on the main thread; inline when called there.
   void didStartRecording();
+  /// As didStartRecording(), for a start that failed; the error may be null. The same holds for the failures below.
   void failedToStartRecordingWithError(const LMRErrorRef& error);
+  /// As didStartRecording(), for a pause.
   void didPauseRecording();
+  /// The pause failed; the flags stay as they were.
   void failedToPauseRecordingWithError(const LMRErrorRef& error);
+  /// As didStartRecording(), for the end of a pause.
   void didResumeRecording();
+  /// The end of the pause failed; the flags stay as they were.
   void failedToResumeRecordingWithError(const LMRErrorRef& error);
-  /// Leaves isStarting() as it was.
+  /// As didStartRecording(), for the end of the recording. Leaves isStarting() as it was.
   void didStopRecording();
+  /// The stop failed; the flags stay as they were.
   void failedToStopRecordingWithError(const LMRErrorRef& error);
+  /// As didStartRecording(), for a recording that was thrown away.
   void didCancelRecording();
+  /// The cancellation failed; the flags stay as they were.
   void failedToCancelRecordingWithError(const LMRErrorRef& error);
 
   /// Opens an interval now. One that was open is dropped without being counted. Any thread.

@@ -8,8 +8,10 @@
 
 class LMRSourceRecorder;
 
-/// The names of the ten messages to a recorder's delegate.
+/// The names of the ten messages to a recorder's delegate, for respondsToSelector().
 namespace LMRDelegateMessage {
+/// @{
+/// The name of the message of LMRSourceRecorderDelegate.
 inline constexpr std::string_view recorderDidStartRecording = "recorderDidStartRecording:";
 inline constexpr std::string_view recorderFailedToStartRecording_error = "recorderFailedToStartRecording:error:";
 inline constexpr std::string_view recorderDidPauseRecording = "recorderDidPauseRecording:";
@@ -20,6 +22,7 @@ inline constexpr std::string_view recorderDidStopRecording = "recorderDidStopRec
 inline constexpr std::string_view recorderFailedToStopRecording_error = "recorderFailedToStopRecording:error:";
 inline constexpr std::string_view recorderDidCancelRecording = "recorderDidCancelRecording:";
 inline constexpr std::string_view recorderFailedToCancelRecording_error = "recorderFailedToCancelRecording:error:";
+/// @}
 } // namespace LMRDelegateMessage
 
 /// Who is told of a recorder's outcomes, always on the main thread and one message at a time, while the thread that
@@ -34,6 +37,7 @@ inline constexpr std::string_view recorderFailedToCancelRecording_error = "recor
 ///     };
 class LUMORA_EXPORT LMRSourceRecorderDelegate {
 public:
+  /// The recorder that a message is about.
   using Recorder = std::shared_ptr<LMRSourceRecorder>;
 
   virtual ~LMRSourceRecorderDelegate();
@@ -41,15 +45,25 @@ public:
   /// Whether the message of that name ("recorderDidStopRecording:") is implemented. Any thread.
   virtual bool respondsToSelector(std::string_view selector) const = 0;
 
+  /// The recording has begun.
   virtual void recorderDidStartRecording(const Recorder& recorder);
+  /// It has not begun. The error, here and below, may be null.
   virtual void recorderFailedToStartRecording_error(const Recorder& recorder, const LMRErrorRef& error);
+  /// The recording is paused.
   virtual void recorderDidPauseRecording(const Recorder& recorder);
+  /// The recording could not be paused.
   virtual void recorderFailedToPauseRecording_error(const Recorder& recorder, const LMRErrorRef& error);
+  /// The recording goes on after a pause.
   virtual void recorderDidResumeRecording(const Recorder& recorder);
+  /// The recording could not go on.
   virtual void recorderFailedToResumeRecording_error(const Recorder& recorder, const LMRErrorRef& error);
+  /// The recording has ended, and what was recorded is complete.
   virtual void recorderDidStopRecording(const Recorder& recorder);
+  /// The recording could not be ended, or it ended with an error: a lost device, a full disk. What was written stays.
   virtual void recorderFailedToStopRecording_error(const Recorder& recorder, const LMRErrorRef& error);
+  /// The recording has ended, and nothing of it is kept.
   virtual void recorderDidCancelRecording(const Recorder& recorder);
+  /// The recording could not be thrown away.
   virtual void recorderFailedToCancelRecording_error(const Recorder& recorder, const LMRErrorRef& error);
 };
 
@@ -109,6 +123,7 @@ template <class Delegate, class Base = LMRSourceRecorderDelegate> class LMRDeleg
 public:
   using Base::Base;
 
+  /// Whether `Delegate` overrides the message of that name.
   bool respondsToSelector(std::string_view selector) const override {
     return lumora::detail::delegateImplements<Delegate>(selector);
   }

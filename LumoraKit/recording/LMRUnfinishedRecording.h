@@ -14,8 +14,8 @@ class LMRSubmissionQueue;
 
 /// A recording that an application has left behind when it died: what there is of it, and what can become of it.
 ///
-///     for (auto& recording : LMRUnfinishedRecording::unfinishedRecordingsInJournal(journal)) {   // on a worker
-///       ... show recording->note() and recording->movies(), ask the user ...
+///     for (const auto& recording : LMRUnfinishedRecording::unfinishedRecordingsInJournal(journal)) {   // on a worker
+///       ...                                                       // show note() and movies(), ask the user
 ///       error = recording->repair();                                // on a worker
 ///       error = recording->prepareSubmissionWithSession(session);   // on a worker: one server command
 ///       error = recording->submitToQueue_session_deleteAfterSubmission(*queue, *session, false);   // main

@@ -16,8 +16,11 @@ public:
   std::string name() const override { return name_.get(); }
   std::string language() const override { return language_.get(); }
 
+  /// From now on the application has this identifier.
   void setIdentifier(std::string identifier) { identifier_.set(std::move(identifier)); }
+  /// From now on the application has this name.
   void setName(std::string name) { name_.set(std::move(name)); }
+  /// From now on the user prefers this language, a BCP 47 tag.
   void setLanguage(std::string language) { language_.set(std::move(language)); }
 
 private:

@@ -12,6 +12,7 @@ namespace lumora::fakes {
 /// A device of the fake capture system; made by FakeMediaCapture::addDevice. Any thread.
 class LUMORA_EXPORT FakeCaptureDevice : public CaptureDevice {
 public:
+  /// A device that delivers these types; FakeMediaCapture::addDevice() makes one and lists it.
   FakeCaptureDevice(std::string uniqueID, std::vector<MediaType> types);
 
   std::string uniqueID() const override { return uniqueID_; }
@@ -27,6 +28,7 @@ public:
 
   /// How often the device was opened.
   int openCount() const;
+  /// The error with which an input of this device is refused; null when none is.
   LMRErrorRef errorWhenAdded() const;
 
 private:
@@ -41,6 +43,7 @@ private:
 /// A stream of a fake input. Any thread.
 class LUMORA_EXPORT FakeCaptureConnection : public CaptureConnection {
 public:
+  /// An enabled stream of that type.
   explicit FakeCaptureConnection(MediaType type) : type_(type) {}
 
   MediaType mediaType() const override { return type_; }
@@ -61,6 +64,7 @@ public:
 
   std::vector<std::shared_ptr<CaptureConnection>> connections() const override { return connections_; }
   std::shared_ptr<CaptureDevice> device() const override { return device_; }
+  /// The device behind the input; null for the screen.
   const std::shared_ptr<FakeCaptureDevice>& fakeDevice() const { return device_; }
 
 private:

@@ -26,9 +26,11 @@ public:
   void stopRunning() override;
   bool isRunning() const override;
 
-  /// The next calls fail with this error; null lets them succeed again.
+  /// The screen is refused with this error from now on; null lets it be added again.
   void failToAddScreenInput(LMRErrorRef error);
+  /// Outputs are refused with this error from now on; null lets them be added again.
   void failToAddOutput(LMRErrorRef error);
+  /// The session does not start, with this error, from now on; null lets it start again.
   void failToStart(LMRErrorRef error);
 
   /// Whether the device is behind one of the inputs.

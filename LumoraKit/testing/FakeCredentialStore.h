@@ -19,6 +19,7 @@ enum class CredentialOperation { Add, Find, Remove, List };
 
 /// One call of a credential store, as it was asked for.
 struct CredentialCall {
+  /// Which operation was called.
   CredentialOperation operation;
   /// Empty for Remove.
   std::string service;
@@ -30,8 +31,11 @@ struct CredentialCall {
 
 /// An item as it is stored. The secret is plain, so that a test can compare it.
 struct StoredCredential {
+  /// The item's service.
   std::string service;
+  /// The item's account.
   std::string account;
+  /// The item's secret.
   std::string secret;
 
   bool operator==(const StoredCredential&) const = default;
@@ -63,7 +67,9 @@ public:
 
   /// The calls so far, in the order of their arrival.
   std::vector<CredentialCall> calls() const;
+  /// How many calls there were.
   std::size_t callCount() const;
+  /// Empties the list of calls.
   void forgetCalls();
 
   LMRErrorRef add(const std::string& service, const std::string& account, const Secret& secret) override;

@@ -15,7 +15,9 @@ namespace lumora::fakes {
 
 /// What a helper agent answers: a reply, an error, both, or neither.
 struct HelperAgentReply {
+  /// The agent's reply; nothing when there is none.
   std::optional<Dictionary> reply;
+  /// Why there is no reply; null when there is one.
   LMRErrorRef error;
 
   /// The command ended with status 0 and this on its standard output.
@@ -28,11 +30,15 @@ struct HelperAgentReply {
 
 /// One call of an agent, as it was asked for.
 struct HelperAgentCall {
+  /// The agent's identifier.
   std::string agent;
+  /// The domain that the agent was looked for in.
   std::string domain;
   /// Nothing when none was given.
   std::optional<Data> authorization;
+  /// The command's name.
   std::string command;
+  /// The request, as the agent gets it.
   Dictionary request;
 };
 
@@ -52,15 +58,18 @@ public:
   void reply(const std::string& command, HelperAgentReply reply);
   /// The answer to one such call; several are given in their order.
   void replyOnce(const std::string& command, HelperAgentReply reply);
+  /// The answer to every other call. Status 0 without an output unless set.
   void setDefaultReply(HelperAgentReply reply);
   /// What authorize() hands out; nothing refuses. One of four bytes unless set.
   void setAuthorization(std::optional<Authorization> authorization);
 
   /// The calls so far, in the order of their arrival.
   std::vector<HelperAgentCall> calls() const;
+  /// How many calls there were.
   std::size_t callCount() const;
   /// The operations that were asked to be authorized.
   std::vector<std::string> authorizedOperations() const;
+  /// Empties the list of calls.
   void forgetCalls();
 
   std::optional<Authorization> authorize(const std::string& agent, std::string_view domain,

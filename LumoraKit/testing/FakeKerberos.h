@@ -18,6 +18,7 @@ public:
   void setDefaultRealm(std::string name);
   /// The look-up fails with this status.
   void fail(std::int32_t status);
+  /// How often the realm was looked up.
   std::size_t lookUpCount() const;
 
   std::int32_t defaultRealm(std::string& name) override;

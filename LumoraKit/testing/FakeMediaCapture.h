@@ -35,24 +35,30 @@ public:
   std::shared_ptr<MovieFileOutput> makeMovieFileOutput() override;
   HostTime hostTime() const override;
 
+  /// Plugs a device in that delivers these types. The first one of a type is its default device.
   std::shared_ptr<FakeCaptureDevice> addDevice(std::string uniqueID, std::vector<MediaType> types);
+  /// Makes a device the default one of a type; null: there is none.
   void setDefaultInputDevice(MediaType type, std::shared_ptr<FakeCaptureDevice> device);
   /// Unplugs a device: it is listed no more, and a recording in progress in a session that uses it ends with an
   /// error.
   void loseDevice(const std::string& uniqueID);
 
-  /// Sessions made from now on refuse the screen, or any output, or do not start, with this error; null lets them
-  /// succeed again. For one session only, ask that session.
+  /// Sessions made from now on refuse the screen with this error; null lets them succeed again. For one session only,
+  /// ask that session.
   void failToAddScreenInput(LMRErrorRef error);
+  /// The same for any output.
   void failToAddOutput(LMRErrorRef error);
+  /// The same for the start of the session.
   void failToStart(LMRErrorRef error);
 
+  /// Sets the clock, in either direction.
   void setHostTime(HostTime time);
   /// Sets the clock forward; the new time.
   HostTime advanceHostTime(HostTime ticks);
 
-  /// What was made, in order.
+  /// The sessions that were made, in their order.
   std::vector<std::shared_ptr<FakeCaptureSession>> sessions() const;
+  /// The outputs that were made, in their order.
   std::vector<std::shared_ptr<FakeMovieFileOutput>> movieFileOutputs() const;
 
 private:

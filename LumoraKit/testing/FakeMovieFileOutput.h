@@ -17,6 +17,7 @@ class FakeCaptureSession;
 /// A sample that holds nothing but its host time, and the levels of its sound when it is given any.
 class LUMORA_EXPORT FakeSampleBuffer : public SampleBuffer {
 public:
+  /// A sample of that host time; sound when it is given levels, one a channel.
   explicit FakeSampleBuffer(std::optional<HostTime> hostTime, std::vector<SoundLevel> soundLevels = {})
       : hostTime_(hostTime), soundLevels_(std::move(soundLevels)) {}
 
@@ -85,10 +86,12 @@ public:
   std::vector<std::string> requests() const;
   /// The moments of those requests that named one.
   std::vector<HostTime> requestedHostTimes() const;
+  /// The options that were set for a connection; nothing when none were.
   std::optional<CompressionOptions> compressionOptions(const CaptureConnection& connection) const;
 
   /// For the session. False when the output is in one already. An output that leaves its session finishes its file.
   bool attachTo(std::weak_ptr<FakeCaptureSession> session);
+  /// The session lets go of the output.
   void detach();
 
 private:

@@ -34,6 +34,8 @@ struct LUMORA_EXPORT FakePlatform {
   /// Installs the members once more, after one of them was replaced.
   void install() const;
 
+  /// @{
+  /// The members of this machine, as lumora::Platform names them. Replace one, then install().
   std::shared_ptr<FakeApplication> application = std::make_shared<FakeApplication>();
   std::shared_ptr<FakeCredentialStore> credentialStore = std::make_shared<FakeCredentialStore>();
   std::shared_ptr<FakeFiles> files = std::make_shared<FakeFiles>();
@@ -47,6 +49,7 @@ struct LUMORA_EXPORT FakePlatform {
   std::shared_ptr<FakeToolRunner> toolRunner = std::make_shared<FakeToolRunner>();
   std::shared_ptr<FakeUserInterface> userInterface = std::make_shared<FakeUserInterface>();
   std::shared_ptr<FakeWallClock> wallClock = std::make_shared<FakeWallClock>();
+  /// @}
 
 private:
   Platform previous_;

@@ -15,13 +15,16 @@ namespace lumora::fakes {
 /// queues. Main thread only.
 class LUMORA_EXPORT FakeNetService final : public NetService, public std::enable_shared_from_this<FakeNetService> {
 public:
+  /// A service that is on no network; FakeServiceDiscovery::add() makes one that is.
   explicit FakeNetService(std::string name);
   ~FakeNetService() override;
 
   /// Ends the resolution that is under way, and tells the delegate at once; false when there is none.
   bool resolve(std::optional<TextRecord> record);
+  /// The resolution that is under way fails, and the delegate is told at once; false when there is none.
   bool fail();
 
+  /// Whether a resolution is under way.
   bool isResolving() const { return isResolving_; }
   /// The limits of the resolutions so far.
   const std::vector<std::chrono::milliseconds>& limits() const { return limits_; }
@@ -47,6 +50,7 @@ public:
 
   /// A service comes, and every search is told at once; a later search is told on a later turn.
   std::shared_ptr<FakeNetService> add(const std::string& name);
+  /// A service goes, and every search is told at once.
   void remove(const std::shared_ptr<FakeNetService>& service);
 
   /// While false, no search can be begun.

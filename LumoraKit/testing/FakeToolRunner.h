@@ -19,8 +19,11 @@ namespace lumora::fakes {
 
 /// What a tool answers.
 struct ToolReply {
+  /// The exit status.
   int status = 0;
+  /// What the tool writes to its standard output.
   std::string standardOutput;
+  /// What the tool writes to its standard error.
   std::string standardError;
 
   /// Status 0 with a property list on standard output, as the server tools answer.
@@ -31,7 +34,9 @@ struct ToolReply {
 
 /// One run of a tool, as the runner was asked for it.
 struct ToolRequest {
+  /// The absolute path that was to be run.
   std::string executable;
+  /// The arguments, without the program's name.
   std::vector<std::string> arguments;
   /// The standard input, byte for byte.
   std::string standardInput;
@@ -66,19 +71,23 @@ public:
   void reply(const std::string& commandOrExecutable, ToolReply reply);
   /// The answer to one such request; several are given in their order.
   void replyOnce(const std::string& commandOrExecutable, ToolReply reply);
+  /// The answer to every other request. Success with an empty dictionary unless set.
   void setDefaultReply(ToolReply reply);
   /// Called without a lock, on the thread of the request.
   void setHandler(Handler handler);
 
   /// From now on requests are recorded but not answered until release(): their threads wait.
   void block();
+  /// Answers the requests that wait, and every later one at once.
   void release();
 
   /// The requests so far, in the order of their arrival.
   std::vector<ToolRequest> requests() const;
+  /// How many requests have arrived.
   std::size_t requestCount() const;
   /// The commands of the requests so far.
   std::vector<std::string> commands() const;
+  /// Empties the list of requests.
   void forgetRequests();
   /// Waits until so many requests have arrived. False when the time is over.
   bool waitForRequests(std::size_t count, std::chrono::milliseconds limit = std::chrono::seconds(30)) const;

@@ -18,6 +18,7 @@ namespace lumora::fakes {
 /// The login panel as a user meets it: shows what the controller says, and takes what the test types and chooses.
 class LUMORA_EXPORT FakeLoginPanel {
 public:
+  /// Made by FakeUserInterface when the controller loads its interface file.
   FakeLoginPanel(const std::shared_ptr<LMRServerLoginViewController>& owner, const std::shared_ptr<OrderList>& orders);
   FakeLoginPanel(const FakeLoginPanel&) = delete;
   FakeLoginPanel& operator=(const FakeLoginPanel&) = delete;
@@ -31,6 +32,7 @@ public:
   bool chooseServer(const std::string& name);
   /// Replaces the text of a field, which must be visible: false when it is not.
   bool typeUserName(const std::string& text);
+  /// The same for the password.
   bool typePassword(const std::string& text);
   /// Clicks the check box; false when it is not visible.
   bool setRememberPassword(bool remember);
@@ -38,6 +40,8 @@ public:
   /// Whether the check box is ticked.
   bool isRememberPasswordTicked() const { return isTicked_; }
 
+  /// @{
+  /// The outlets of the panel, as lumora::ServerLoginView names them.
   const std::shared_ptr<FakeView> view;
   const std::shared_ptr<FakeComboBox> serverField;
   const std::shared_ptr<KTServiceComboBox> serverComboBox;
@@ -49,6 +53,7 @@ public:
   const std::shared_ptr<FakeView> serverRequiredImageView;
   const std::shared_ptr<FakeView> userNameRequiredImageView;
   const std::shared_ptr<FakeView> passwordRequiredImageView;
+  /// @}
 
 private:
   void bindTo(LMRServerLoginViewController& owner);
@@ -61,19 +66,24 @@ private:
 /// The window of the login sheet as a user meets it.
 class LUMORA_EXPORT FakeLoginWindow {
 public:
+  /// Made by FakeUserInterface when the controller loads its interface file.
   FakeLoginWindow(const std::shared_ptr<LMRServerLoginSheetController>& owner,
                   const std::shared_ptr<OrderList>& orders);
   FakeLoginWindow(const FakeLoginWindow&) = delete;
   FakeLoginWindow& operator=(const FakeLoginWindow&) = delete;
   ~FakeLoginWindow();
 
-  /// Clicks a button of a window that is shown; false when it is not, or when the button is disabled.
+  /// Clicks the button that logs in; false when the window is not shown or the button is disabled.
   bool clickDefaultButton();
+  /// Clicks the button that closes the sheet; false when the window is not shown.
   bool clickAlternateButton();
+  /// Whether the button that logs in can be clicked.
   bool isDefaultButtonEnabled() const { return isDefaultButtonEnabled_; }
   /// What the page that is shown says: the progress, the error, or nothing.
   std::string visibleText() const;
 
+  /// @{
+  /// The outlets of the window, as lumora::ServerLoginWindow names them.
   const std::shared_ptr<FakeWindow> window;
   const std::shared_ptr<FakeContainerView> serverLoginView;
   const std::shared_ptr<FakeTabView> progressAndErrorTabView;
@@ -81,6 +91,7 @@ public:
   const std::shared_ptr<FakeView> errorTextField;
   const std::shared_ptr<FakeButton> defaultButton;
   const std::shared_ptr<FakeButton> alternateButton;
+  /// @}
 
 private:
   const std::weak_ptr<LMRServerLoginSheetController> owner_;
@@ -98,8 +109,9 @@ public:
   FakeUserInterface();
   ~FakeUserInterface() override;
 
-  /// What was loaded last; null before.
+  /// The panel that was loaded last; null before.
   const std::shared_ptr<FakeLoginPanel>& panel() const { return panel_; }
+  /// The window that was loaded last; null before.
   const std::shared_ptr<FakeLoginWindow>& window() const { return window_; }
   /// Lets go of both, as a toolkit does whose windows were destroyed.
   void forgetViews();
@@ -109,6 +121,7 @@ public:
 
   /// The orders of everything loaded here, and "beep".
   const std::vector<std::string>& orders() const { return orders_->all(); }
+  /// Empties the list of orders.
   void forgetOrders() { orders_->clear(); }
 
   ServerLoginView loadServerLoginView(const std::shared_ptr<LMRServerLoginViewController>& owner) override;

@@ -12,9 +12,12 @@ public:
   FakeWallClock();
   ~FakeWallClock() override;
 
+  /// The time as the test has set it.
   WallTime now() const override { return now_.load(); }
 
+  /// Sets the clock, in either direction.
   void set(WallTime now) { now_.store(now); }
+  /// Moves the clock forward.
   void advance(WallTime::duration by);
 
 private:

@@ -22,7 +22,9 @@ public:
   std::vector<std::string> lines() const;
   /// How many lines hold this text.
   std::size_t count(std::string_view text) const;
+  /// Whether a line holds this text.
   bool contains(std::string_view text) const { return count(text) > 0; }
+  /// Forgets the lines so far.
   void clear();
 
 private:

@@ -11,6 +11,7 @@
 /// One recorded file on its way into a submission of a server, with everything that is needed to file it. A value
 /// without a behaviour of its own; see LMRSubmissionQueue.
 struct LUMORA_EXPORT LMRSubmission {
+  /// What a submission waits for.
   enum class State {
     /// For its turn, for a session, or for the end of the pause after a failure.
     Waiting,
@@ -37,13 +38,16 @@ struct LUMORA_EXPORT LMRSubmission {
 
   // Whose session it needs: server, port and user as in the session. Passwords are not kept.
 
+  /// The host name of the server.
   std::string server;
+  /// The port of the server; 0 is the default port.
   std::uint16_t port = LMRDefaultServerPort;
   /// Empty with single sign-on.
   std::string userName;
 
   // How far it is.
 
+  /// What it waits for now.
   State state = State::Waiting;
   /// How often it was tried, the try under way included.
   std::uint32_t attempts = 0;

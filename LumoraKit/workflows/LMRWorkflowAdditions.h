@@ -39,6 +39,7 @@ LUMORA_EXPORT bool acceptsDual(const lumora::Dictionary& workflow);
 /// True: no content type is refused.
 LUMORA_EXPORT bool supportsFileContentType(const lumora::Dictionary& workflow, std::string_view contentType);
 
+/// What kind of recording the workflow takes, by the number and the types of its sources.
 LUMORA_EXPORT LMRWorkflowType workflowType(const lumora::Dictionary& workflow);
 
 } // namespace LMRWorkflowAdditions
