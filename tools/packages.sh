@@ -30,6 +30,8 @@ test_packages=("${headless_packages[@]}" "${login_packages[@]}" gstreamer1.0-too
 bench_packages=(libbenchmark-dev libpipewire-0.3-dev gstreamer1.0-tools bsdextrautils dbus gnome-keyring)
 # The pictures of the login panel: an optimiser, the letters that they show, and a desktop's own style.
 picture_packages=(optipng fonts-dejavu-core fonts-ipaexfont-gothic adwaita-qt6)
+# The site of the documentation.
+site_packages=(doxygen python3)
 check_packages=(clang-format-14 git python3)
 lint_packages=(clang-14 clang-tidy-14 libclang-rt-14-dev python3)
 
