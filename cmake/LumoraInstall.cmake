@@ -1,9 +1,12 @@
-# What an installation holds: the libraries, the public headers, the package files for CMake and pkg-config.
+# What an installation holds: the libraries, the public headers, the package files for CMake and pkg-config. The
+# components are those of the Debian packages; programs set theirs in their folders.
 
 include(CMakePackageConfigHelpers)
 set_property(DIRECTORY APPEND PROPERTY CMAKE_CONFIGURE_DEPENDS ${PROJECT_SOURCE_DIR}/LumoraKit/LumoraKit.h)
 
-install(TARGETS lumorakit lumorakit-testing EXPORT LumoraKitTargets)
+set(CMAKE_INSTALL_DEFAULT_COMPONENT_NAME development)
+install(TARGETS lumorakit EXPORT LumoraKitTargets LIBRARY COMPONENT library NAMELINK_COMPONENT development)
+install(TARGETS lumorakit-testing EXPORT LumoraKitTargets)
 # What LumoraKit.h includes is public, and nothing else is.
 file(STRINGS ${PROJECT_SOURCE_DIR}/LumoraKit/LumoraKit.h public_headers REGEX "^#include <LumoraKit/")
 list(TRANSFORM public_headers REPLACE "^#include <LumoraKit/(.*)>.*" "\\1")
@@ -14,7 +17,7 @@ foreach(header LumoraKit.h ${public_headers} ${fakes})
 endforeach()
 
 if(LUMORAKIT_QT)
-  install(TARGETS lumorakit-qt EXPORT LumoraKitTargets)
+  install(TARGETS lumorakit-qt EXPORT LumoraKitTargets LIBRARY COMPONENT qt-library NAMELINK_COMPONENT development)
   install(FILES ${PROJECT_SOURCE_DIR}/LumoraKit/platform/qt/LumoraKitQt.h
           DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/LumoraKit/platform/qt)
 endif()

@@ -26,12 +26,13 @@ login_packages=(dbus gnome-keyring avahi-daemon iproute2 krb5-kdc krb5-admin-ser
 
 demo_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
 test_packages=("${headless_packages[@]}" "${login_packages[@]}" gstreamer1.0-tools ffmpeg polkitd xdg-desktop-portal man-db mandoc zsh
-  at-spi2-core gir1.2-atspi-2.0 python3-gi)
-bench_packages=(libbenchmark-dev libpipewire-0.3-dev gstreamer1.0-tools bsdextrautils dbus gnome-keyring)
+  at-spi2-core gir1.2-atspi-2.0 python3-gi x11-xserver-utils)
+bench_packages=(libbenchmark-dev libxml2-dev libpipewire-0.3-dev gstreamer1.0-tools bsdextrautils dbus gnome-keyring)
 # The pictures of the login panel: an optimiser, the letters that they show, and a desktop's own style.
 picture_packages=(optipng fonts-dejavu-core fonts-ipaexfont-gothic adwaita-qt6)
 # The site of the documentation.
 site_packages=(doxygen python3)
+package_packages=(dpkg-dev file lintian desktop-file-utils appstream debootstrap)
 check_packages=(clang-format-14 git python3)
 lint_packages=(clang-14 clang-tidy-14 libclang-rt-14-dev python3)
 

@@ -5,6 +5,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <fstream>
+#include <sstream>
 #include <vector>
 
 namespace lumora::bench {
@@ -48,17 +49,31 @@ std::map<std::string, double> runBenchmarks(int argc, char** argv) {
   return collector.seconds;
 }
 
-bool report(const std::string& what, double value, Bar direction, double bar, const std::string& unit) {
-  const bool reached = direction == Bar::AtMost ? value <= bar : value >= bar;
-  const char* const word = direction == Bar::AtMost ? "at most" : "at least";
-  std::printf("%-72s %10.3f %-6s (%s %g) %s\n", what.c_str(), value, unit.c_str(), word, bar,
-              reached ? "reached" : "MISSED");
+namespace {
+
+// A row of the table: figure, value, unit, bar, outcome.
+void addRow(const std::string& what, double value, const std::string& unit, const std::string& bar,
+            const std::string& outcome) {
+  std::printf("%-72s %10.3f %-6s %s %s\n", what.c_str(), value, unit.c_str(), bar.c_str(), outcome.c_str());
   std::fflush(stdout);
   if (const char* const path = std::getenv("LUMORA_FIGURES")) {
-    std::ofstream(path, std::ios::app) << what << '\t' << value << '\t' << unit << '\t' << word << '\t' << bar << '\t'
-                                       << (reached ? "reached" : "MISSED") << '\n';
+    std::ofstream(path, std::ios::app) << what << '\t' << value << '\t' << unit << '\t' << bar << '\t' << outcome
+                                       << '\n';
   }
+}
+
+} // namespace
+
+bool report(const std::string& what, double value, Bar direction, double bar, const std::string& unit) {
+  const bool reached = direction == Bar::AtMost ? value <= bar : value >= bar;
+  std::ostringstream limit;
+  limit << (direction == Bar::AtMost ? "at most " : "at least ") << bar;
+  addRow(what, value, unit, limit.str(), reached ? "reached" : "MISSED");
   return reached;
+}
+
+void tell(const std::string& what, double value, const std::string& unit) {
+  addRow(what, value, unit, "-", "told");
 }
 
 } // namespace lumora::bench

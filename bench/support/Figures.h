@@ -19,4 +19,7 @@ std::map<std::string, double> runBenchmarks(int argc, char** argv);
 /// rows named by LUMORA_FIGURES). True when the bar is reached.
 bool report(const std::string& what, double value, Bar direction, double bar, const std::string& unit = "x");
 
+/// The same for a figure that has no bar.
+void tell(const std::string& what, double value, const std::string& unit = "x");
+
 } // namespace lumora::bench
