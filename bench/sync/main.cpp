@@ -215,7 +215,7 @@ int measure(double seconds) {
 } // namespace
 
 int main(int argc, char** argv) {
-  const std::string_view mode = argc > 1 ? argv[1] : "60";
+  const std::string_view mode = argc > 1 ? argv[1] : "180";
   if (mode == "--generate") {
     return generate();
   }

@@ -106,6 +106,10 @@ bool HeadlessDevices::restart(const std::string& service) {
   return request("restart " + service);
 }
 
+bool HeadlessDevices::resizeScreen(int width, int height) {
+  return request("resize " + std::to_string(width) + " " + std::to_string(height));
+}
+
 bool HeadlessDevices::request(const std::string& line) {
   const std::string text = line + "\n";
   return ::write(input_, text.data(), text.size()) == static_cast<ssize_t>(text.size()) && readLine() == "OK";

@@ -20,7 +20,8 @@ public:
   HeadlessDevices& operator=(const HeadlessDevices&) = delete;
   ~HeadlessDevices();
 
-  /// `kind`: "camera", "microphone", "silent-camera" or "stuck-camera". True when the device is there.
+  /// `kind`: "camera", "microphone", "silent-camera", "stuck-camera" or "picture" (something to see on the screen).
+  /// True when the device is there.
   bool add(const std::string& kind, const std::string& name);
   /// Unplugs a device; true when it is gone. The first ones are "lumora_camera" and "lumora_microphone".
   bool remove(const std::string& name);
@@ -29,6 +30,8 @@ public:
   bool freeze(const std::string& name);
   bool thaw(const std::string& name);
   bool restart(const std::string& service);
+  /// Gives the screen another resolution, at most its first one. False also when that program is not installed.
+  bool resizeScreen(int width, int height);
 
 private:
   HeadlessDevices() = default;

@@ -62,6 +62,13 @@ std::vector<double> Movie::times(const std::string& type) const {
   return times;
 }
 
+std::vector<std::uint8_t> Movie::middleRow(double seconds) const {
+  const Result result = shell("ffmpeg -v error -ss " + std::to_string(seconds) + " -i '" + file_.string() +
+                              "' -map 0:v -vf crop=iw:2:0:ih/2 -frames:v 1 -f rawvideo -pix_fmt gray -");
+  const auto row = result.output.substr(0, result.output.size() / 2);
+  return {row.begin(), row.end()};
+}
+
 std::vector<double> Movie::sound() const {
   const Result result = shell("ffmpeg -v error -i '" + file_.string() +
                               "' -map 0:a -af aresample=48000:async=1:first_pts=0 -ac 2 -f s16le -");

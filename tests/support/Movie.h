@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstdint>
 #include <filesystem>
 #include <string>
 #include <vector>
@@ -24,6 +25,8 @@ public:
   std::vector<double> times(const std::string& type) const;
   /// The left channel, decoded at 48 kHz, with silence where the file has none.
   std::vector<double> sound() const;
+  /// The brightness (0 to 255) along the middle of the picture that is shown at a moment; empty without one.
+  std::vector<std::uint8_t> middleRow(double seconds) const;
 
 private:
   std::string probe(const std::string& arguments) const;

@@ -308,6 +308,34 @@ TEST_F(Recording, recordsTheScreenWithAMicrophone_whenAnXServerRuns) {
   EXPECT_EQ(movie.stream("a", "codec_name"), "aac");
 }
 
+TEST_F(Recording, keepsItsSizeAndShowsAllOfTheScreen_whenItsResolutionChanges) {
+  ASSERT_TRUE(devices_->add("picture", "test"));
+  ASSERT_EQ(session_->addInput(capture().makeScreenInput()), nullptr);
+  run();
+  startAtNextPicture(file("a.mov"));
+  std::this_thread::sleep_for(1s);
+  if (!devices_->resizeScreen(640, 480)) {
+    GTEST_SKIP() << "the screen cannot be given another resolution (xrandr is not installed)";
+  }
+  std::this_thread::sleep_for(1s);
+  stopAtNextPicture();
+  ASSERT_TRUE(delegate_->waitForEnd(file("a.mov")));
+  EXPECT_EQ(delegate_->lastError(), nullptr);
+  const Movie movie(file("a.mov"));
+  EXPECT_TRUE(movie.decodes());
+  EXPECT_EQ(movie.stream("v", "width"), "1280");
+  // A screen of 4 to 3 in a picture of 16 to 9: bars at the sides.
+  constexpr std::size_t beside = 80;
+  constexpr std::size_t within = 320;
+  const auto before = movie.middleRow(0.5);
+  const auto after = movie.middleRow(movie.duration() - 0.2);
+  ASSERT_EQ(before.size(), 1280U);
+  ASSERT_EQ(after.size(), 1280U);
+  EXPECT_GT(before[beside], 100);
+  EXPECT_LT(after[beside], 30);
+  EXPECT_GT(after[within], 100);
+}
+
 TEST_F(Recording, isFinished_whenTheSessionStops) {
   addCameraAndMicrophone();
   run();
