@@ -3,7 +3,6 @@
 set(CPACK_GENERATOR DEB)
 set(CPACK_PACKAGE_NAME lumorakit)
 set(CPACK_PACKAGE_CONTACT "Lumora maintainers <maintainers@lumora.example>")
-set(CPACK_PACKAGE_DESCRIPTION_SUMMARY "${PROJECT_DESCRIPTION}")
 set(CPACK_PACKAGE_DIRECTORY ${PROJECT_BINARY_DIR}/packages)
 set(CPACK_STRIP_FILES ON)
 set(CPACK_INSTALL_DEFAULT_DIRECTORY_PERMISSIONS OWNER_READ OWNER_WRITE OWNER_EXECUTE GROUP_READ GROUP_EXECUTE WORLD_READ
@@ -44,6 +43,7 @@ server.
 .
 This package contains the shared library."
   # The elements that record: sources (PipeWire, PulseAudio, X11), converters, the muxer, an encoder of each kind.
+  CONTROL_EXTRA ${PROJECT_SOURCE_DIR}/packaging/debian/triggers
   DEPENDS "gstreamer1.0-plugins-base, gstreamer1.0-plugins-good, gstreamer1.0-plugins-bad, gstreamer1.0-libav, gstreamer1.0-pipewire, gstreamer1.0-pulseaudio, gstreamer1.0-x"
   RECOMMENDS "gstreamer1.0-plugins-ugly, avahi-daemon, gnome-keyring | keepassxc"
   SUGGESTS "krb5-user, polkitd")
@@ -55,6 +55,7 @@ they can and remember what the user wants remembered, for applications of
 Qt 6 Widgets that use LumoraKit.
 .
 This package contains the shared library."
+    CONTROL_EXTRA ${PROJECT_SOURCE_DIR}/packaging/debian/triggers
     DEPENDS "${needs_library}")
   set(needs_qt_library ", liblumorakit-qt1 (= ${PROJECT_VERSION})")
 endif()
@@ -70,10 +71,10 @@ library of fakes with which an application tests itself without a server."
   SUGGESTS "lumora-tools, qt6-base-dev, libgtest-dev")
 lumora_package(
   tools lumora-tools utils "command-line client and sandbox server of the Lumora podcast production system"
-  "The client \"lumora\" runs any operation of a Lumora server from a shell or a
-script. The sandbox \"lumora-sandbox\" is a self-contained stand-in for a server
-to develop and try against, with its helper agent. \"recordertester\" tries the
-capture devices of this machine."
+  "The client lumora runs any operation of a Lumora server from a shell or a
+script. lumora-sandbox is a self-contained stand-in for a server to develop and
+try against, with its helper agent. recordertester tries the capture devices of
+this machine."
   DEPENDS "${needs_library}"
   RECOMMENDS "bash-completion, default-dbus-system-bus, polkitd"
   SUGGESTS "avahi-daemon, krb5-user")
