@@ -33,10 +33,6 @@ picture_packages=(optipng fonts-dejavu-core fonts-ipaexfont-gothic adwaita-qt6)
 # The site of the documentation.
 site_packages=(doxygen python3)
 package_packages=(dpkg-dev file lintian desktop-file-utils appstream debootstrap)
-bench_packages=(libbenchmark-dev libxml2-dev libpipewire-0.3-dev gstreamer1.0-tools bsdextrautils dbus gnome-keyring)
-# The pictures of the login panel: an optimiser, the letters that they show, and a desktop's own style.
-picture_packages=(optipng fonts-dejavu-core fonts-ipaexfont-gothic adwaita-qt6)
-package_packages=(dpkg-dev file lintian desktop-file-utils appstream debootstrap)
 check_packages=(clang-format-14 git python3)
 lint_packages=(clang-14 clang-tidy-14 libclang-rt-14-dev python3)
 
