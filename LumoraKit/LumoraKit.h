@@ -73,6 +73,7 @@
 #include <LumoraKit/recording/LMRSourceRecorder.h>
 #include <LumoraKit/recording/LMRSourceRecorderDelegate.h>
 #include <LumoraKit/recording/LMRUnfinishedRecording.h>
+#include <LumoraKit/recording/LMRVideoPreview.h>
 #include <LumoraKit/workflows/LMRSubmission.h>
 #include <LumoraKit/workflows/LMRSubmissionQueue.h>
 #include <LumoraKit/workflows/LMRWorkflowAdditions.h>

@@ -15,6 +15,10 @@ std::vector<SoundLevel> SampleBuffer::soundLevels() const {
   return {};
 }
 
+std::optional<Picture> SampleBuffer::picture(std::uint32_t, std::uint32_t) const {
+  return std::nullopt;
+}
+
 void MovieFileOutput::recordToOutputFileURL_atHostTime(const std::filesystem::path& file, HostTime) {
   recordToOutputFileURL(file);
 }

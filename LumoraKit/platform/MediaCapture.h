@@ -118,6 +118,18 @@ struct SoundLevel {
   friend bool operator==(const SoundLevel&, const SoundLevel&) = default;
 };
 
+/// A picture as a screen shows it: rows of red, green and blue from the upper left corner, a byte each and without
+/// gaps.
+struct Picture {
+  /// In pixels.
+  std::uint32_t width = 0;
+  std::uint32_t height = 0;
+  /// width * height * 3 bytes.
+  std::vector<std::uint8_t> rgb;
+
+  friend bool operator==(const Picture&, const Picture&) = default;
+};
+
 /// A captured sample buffer, valid during the callback that shows it.
 class LUMORA_EXPORT SampleBuffer {
 public:
@@ -126,6 +138,9 @@ public:
   virtual std::optional<HostTime> hostTime() const = 0;
   /// One a channel; none for a picture. Reads the whole buffer.
   virtual std::vector<SoundLevel> soundLevels() const;
+  /// The picture, made smaller where it must be to fit into that size (in pixels), in its own proportions; nothing for
+  /// sound, and without a definition of its own. Converts the whole picture: a millisecond or two.
+  virtual std::optional<Picture> picture(std::uint32_t maximumWidth, std::uint32_t maximumHeight) const;
 };
 
 class MovieFileOutput;

@@ -1,5 +1,6 @@
 #include <LumoraKit/platform/Platform.h>
 #include <LumoraKit/recording/LMRLevelMeter.h>
+#include <LumoraKit/recording/LMRSampleListener.h>
 
 #include <algorithm>
 #include <cmath>
@@ -17,24 +18,8 @@ lumora::HostTime now() {
 
 } // namespace
 
-// Shown every sample of the session. It outlives the meter for as long as a device shows one.
-class LMRLevelMeter::Listener final : public lumora::MovieFileOutputDelegate {
+class LMRLevelMeter::Listener final : public lumora::SampleListener {
 public:
-  using Output = std::shared_ptr<lumora::MovieFileOutput>;
-  using File = std::filesystem::path;
-
-  void captureOutput_didStartRecordingToOutputFileAtURL_forConnections(const Output&, const File&,
-                                                                       const Connections&) override {}
-  void captureOutput_didPauseRecordingToOutputFileAtURL_forConnections(const Output&, const File&,
-                                                                       const Connections&) override {}
-  void captureOutput_didResumeRecordingToOutputFileAtURL_forConnections(const Output&, const File&,
-                                                                        const Connections&) override {}
-  void captureOutput_willFinishRecordingToOutputFileAtURL_forConnections_dueToError(const Output&, const File&,
-                                                                                    const Connections&,
-                                                                                    const LMRErrorRef&) override {}
-  void captureOutput_didFinishRecordingToOutputFileAtURL_forConnections_dueToError(const Output&, const File&,
-                                                                                   const Connections&,
-                                                                                   const LMRErrorRef&) override {}
   void captureOutput_didOutputSampleBuffer_fromConnection(lumora::MovieFileOutput&,
                                                           const lumora::SampleBuffer& sampleBuffer,
                                                           lumora::CaptureConnection& connection) override {
@@ -74,16 +59,12 @@ private:
 std::unique_ptr<LMRLevelMeter>
 LMRLevelMeter::meterWithCaptureSession_error(const std::shared_ptr<lumora::CaptureSession>& session,
                                              LMRErrorRef* error) {
-  const auto output = lumora::Platform::current().mediaCapture->makeMovieFileOutput();
   auto listener = std::make_shared<Listener>();
-  output->setDelegate(listener);
-  if (LMRErrorRef refusal = session->addOutput(output)) {
-    if (error) {
-      *error = std::move(refusal);
-    }
+  auto output = lumora::SampleListener::join(*session, listener, error);
+  if (!output) {
     return nullptr;
   }
-  return std::unique_ptr<LMRLevelMeter>(new LMRLevelMeter(session, output, std::move(listener)));
+  return std::unique_ptr<LMRLevelMeter>(new LMRLevelMeter(session, std::move(output), std::move(listener)));
 }
 
 LMRLevelMeter::LMRLevelMeter(std::shared_ptr<lumora::CaptureSession> session,

@@ -17,6 +17,11 @@ std::vector<SoundLevel> FakeSampleBuffer::soundLevels() const {
   return soundLevels_;
 }
 
+std::optional<Picture> FakeSampleBuffer::picture(std::uint32_t, std::uint32_t) const {
+  ++reads_;
+  return picture_;
+}
+
 FakeMovieFileOutput::FakeMovieFileOutput() = default;
 FakeMovieFileOutput::~FakeMovieFileOutput() = default;
 

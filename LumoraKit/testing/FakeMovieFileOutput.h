@@ -14,21 +14,26 @@ namespace lumora::fakes {
 
 class FakeCaptureSession;
 
-/// A sample that holds nothing but its host time, and the levels of its sound when it is given any.
+/// A sample that holds nothing but its host time, and the levels of its sound or its picture when it is given any.
 class LUMORA_EXPORT FakeSampleBuffer : public SampleBuffer {
 public:
   /// A sample of that host time; sound when it is given levels, one a channel.
   explicit FakeSampleBuffer(std::optional<HostTime> hostTime, std::vector<SoundLevel> soundLevels = {})
       : hostTime_(hostTime), soundLevels_(std::move(soundLevels)) {}
+  FakeSampleBuffer(std::optional<HostTime> hostTime, Picture picture)
+      : hostTime_(hostTime), picture_(std::move(picture)) {}
 
   std::optional<HostTime> hostTime() const override;
   std::vector<SoundLevel> soundLevels() const override;
+  /// The picture as it was given: it is not made smaller.
+  std::optional<Picture> picture(std::uint32_t maximumWidth, std::uint32_t maximumHeight) const override;
   /// How often something of it was read.
   int reads() const { return reads_; }
 
 private:
   const std::optional<HostTime> hostTime_;
   const std::vector<SoundLevel> soundLevels_;
+  const std::optional<Picture> picture_;
   mutable std::atomic<int> reads_ = 0;
 };
 

@@ -1,4 +1,5 @@
 #include <LumoraKit/platform/linux/gstreamer/CapturedSample.h>
+#include <LumoraKit/platform/linux/gstreamer/PictureConversion.h>
 
 #include <gst/audio/audio.h>
 
@@ -61,6 +62,10 @@ std::vector<SoundLevel> CapturedSample::soundLevels() const {
     levels.push_back(levelOfChannel(buffer, channel, channels));
   }
   return levels;
+}
+
+std::optional<Picture> CapturedSample::picture(std::uint32_t maximumWidth, std::uint32_t maximumHeight) const {
+  return convertedPicture(sample_, {maximumWidth, maximumHeight});
 }
 
 } // namespace lumora::backend

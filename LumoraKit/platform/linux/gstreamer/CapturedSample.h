@@ -13,6 +13,7 @@ public:
 
   std::optional<HostTime> hostTime() const override { return time_; }
   std::vector<SoundLevel> soundLevels() const override;
+  std::optional<Picture> picture(std::uint32_t maximumWidth, std::uint32_t maximumHeight) const override;
 
   HostTime time() const { return time_; }
   GstSample& sample() const { return sample_; }
