@@ -28,8 +28,10 @@ demo_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
 test_packages=("${headless_packages[@]}" "${login_packages[@]}" gstreamer1.0-tools ffmpeg polkitd xdg-desktop-portal man-db mandoc zsh
   at-spi2-core gir1.2-atspi-2.0 python3-gi x11-xserver-utils)
 bench_packages=(libbenchmark-dev libxml2-dev libpipewire-0.3-dev gstreamer1.0-tools bsdextrautils dbus gnome-keyring)
-# The pictures of the login panel: an optimiser, the letters that they show, and a desktop's own style.
-picture_packages=(optipng fonts-dejavu-core fonts-ipaexfont-gothic adwaita-qt6)
+# The pictures of the login panel and the recorder: an optimiser, the letters that they show, a desktop's own style, and a
+# desktop with light and dark colours that a script uses by keyboard and mouse.
+picture_packages=("${headless_packages[@]}" gstreamer1.0-tools optipng fonts-dejavu-core fonts-ipaexfont-gothic
+  adwaita-qt6 imagemagick jwm qt6ct x11-utils xdotool)
 # The site of the documentation.
 site_packages=(doxygen python3)
 package_packages=(dpkg-dev file lintian desktop-file-utils appstream debootstrap)

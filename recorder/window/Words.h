@@ -1,0 +1,20 @@
+#pragma once
+
+#include "recorder/model/Texts.h"
+
+#include <QString>
+
+namespace recorder {
+
+/// The text for the user of an English one.
+inline QString words(Text english) {
+  return QString::fromStdString(text(english));
+}
+
+/// "0:07", "1:02:03".
+QString clockText(double seconds);
+
+/// For a forecast, rounded down: "3 h 20 min", "12 min", "40 s".
+QString spanText(double seconds);
+
+} // namespace recorder

@@ -1,0 +1,62 @@
+#include "recorder/model/Texts.h"
+
+#include <LumoraKit/testing/FakePlatform.h>
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <set>
+#include <string>
+
+namespace recorder {
+namespace {
+
+// The places that are filled in, and whether there is a key that leads to it.
+std::multiset<std::string> marksOf(std::string_view text) {
+  std::multiset<std::string> marks;
+  for (std::size_t i = 0; i + 1 < text.size(); ++i) {
+    if (text[i] == '%' && text[i + 1] != ' ') {
+      marks.insert(std::string(text.substr(i, 2)));
+    } else if (text[i] == '&') {
+      marks.insert("&");
+    }
+  }
+  return marks;
+}
+
+TEST(Texts, areThereInAllLanguages_withTheSamePlaces) {
+  for (const TextEntry& entry : textTable) {
+    for (const std::string_view each : {entry.german, entry.french, entry.spanish, entry.japanese}) {
+      EXPECT_FALSE(each.empty()) << entry.english;
+      EXPECT_EQ(marksOf(each), marksOf(entry.english)) << each;
+    }
+  }
+}
+
+TEST(Texts, standOnceInTheTable) {
+  std::set<std::string_view> all;
+  for (const TextEntry& entry : textTable) {
+    EXPECT_TRUE(all.insert(entry.english).second) << entry.english;
+  }
+}
+
+TEST(Texts, followTheLanguageOfTheApplication) {
+  const lumora::fakes::FakePlatform platform;
+  EXPECT_EQ(text("Record"), "Record");
+  for (const auto& [language, expected] :
+       {std::pair("de-AT", "Aufnehmen"), std::pair("fr", "Enregistrer"), std::pair("es", "Grabar"),
+        std::pair("ja", "収録"), std::pair("nl", "Record")}) {
+    platform.application->setLanguage(language);
+    EXPECT_EQ(text("Record"), expected);
+  }
+}
+
+TEST(Texts, areFilled) {
+  const lumora::fakes::FakePlatform platform;
+  EXPECT_EQ(filled("%1 at %2", {"Ada", "localhost"}), "Ada at localhost");
+  EXPECT_EQ(filled("Room for %1", {"%1"}), "Room for %1");
+}
+
+} // namespace
+} // namespace recorder
