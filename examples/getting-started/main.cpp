@@ -4,19 +4,6 @@
 
 namespace {
 
-// What the recorder reports. Its messages come on the main thread.
-class Outcome : public LMRDelegateImplementation<Outcome> {
-public:
-  void recorderDidStopRecording(const Recorder& /*recorder*/) override { isFinished = true; }
-  void recorderFailedToStopRecording_error(const Recorder& /*recorder*/, const LMRErrorRef& failure) override {
-    isFinished = true;
-    error = failure;
-  }
-
-  bool isFinished = false;
-  LMRErrorRef error;
-};
-
 // Prints an error; whether there was one.
 bool failed(const LMRErrorRef& error) {
   if (error) {
@@ -24,6 +11,23 @@ bool failed(const LMRErrorRef& error) {
   }
   return error != nullptr;
 }
+
+// What the recorder reports. Its messages come on the main thread.
+class Outcome : public LMRDelegateImplementation<Outcome> {
+public:
+  void recorderDidStopRecording(const Recorder& /*recorder*/) override { isFinished = true; }
+  void recorderFailedToStartRecording_error(const Recorder& /*recorder*/, const LMRErrorRef& error) override {
+    hasFailed = true;
+    failed(error);
+  }
+  void recorderFailedToStopRecording_error(const Recorder& /*recorder*/, const LMRErrorRef& error) override {
+    hasFailed = true;
+    failed(error);
+  }
+
+  bool isFinished = false;
+  bool hasFailed = false;
+};
 
 // The session that every further operation takes; null when the login failed.
 std::shared_ptr<LMRSession> logIn(const std::string& user, const std::string& password) {
@@ -37,6 +41,7 @@ std::shared_ptr<LMRSession> logIn(const std::string& user, const std::string& pa
 std::optional<std::string> chooseWorkflow(const std::shared_ptr<LMRSession>& session) {
   const auto list = LMRActionFactory::actionToListWorkflowsWithSession(session);
   list->runSynchronously();
+  failed(list->error());
   const auto reply = list->result();
   const lumora::Array* const workflows = reply ? reply->array(LMRWorkflowsKey) : nullptr;
   for (const lumora::Value& entry : workflows ? *workflows : lumora::Array()) {
@@ -53,8 +58,10 @@ std::optional<std::string> record(double seconds) {
   const auto devices = LMRCaptureSessionAdditions::captureSessionWithAudioDevice_videoDevice_error(
       LMRCaptureDeviceAdditions::defaultAudioCaptureDevice(), LMRCaptureDeviceAdditions::defaultVideoCaptureDevice(),
       &error);
-  if (!devices || failed(error = devices->startRunning())) {
-    failed(error);
+  if (devices) {
+    error = devices->startRunning();
+  }
+  if (failed(error) || !devices) {
     return std::nullopt;
   }
   const auto outcome = std::make_shared<Outcome>();
@@ -64,10 +71,10 @@ std::optional<std::string> record(double seconds) {
   recorder->start();
   // A program without a main loop serves the main thread itself.
   const auto& mainThread = lumora::Platform::current().mainThread;
-  mainThread->serveUntil([&] { return outcome->isFinished || recorder->elapsedRecordingTime() >= seconds; });
+  mainThread->serveUntil([&] { return outcome->hasFailed || recorder->elapsedRecordingTime() >= seconds; });
   recorder->stop();
-  mainThread->serveUntil([&] { return outcome->isFinished; });
-  return failed(outcome->error) ? std::nullopt : std::optional(recorder->outputFileURL()->string());
+  mainThread->serveUntil([&] { return outcome->hasFailed || outcome->isFinished; });
+  return outcome->hasFailed ? std::nullopt : std::optional(recorder->outputFileURL()->string());
 }
 
 bool submit(const std::string& file, const std::string& workflow, const std::shared_ptr<LMRSession>& session) {
