@@ -183,9 +183,9 @@ void showLevels(const std::shared_ptr<lumora::CaptureSession>& session, Bar* bar
 }
 
 // LMRRecorderClasses.h
-std::string archived(const std::shared_ptr<LMRLocalVideoRecorder>& recorder) {
+void archive(const std::shared_ptr<LMRLocalVideoRecorder>& recorder, std::string* kept) {
   const auto archive = lumora::KeyedArchiver::archivedData(*recorder);
-  return archive;
+  *kept = archive;
 }
 
 std::shared_ptr<LMRSourceRecorder> unarchived(const std::string& archive) {
