@@ -123,6 +123,7 @@ struct SoundLevel {
 struct Picture {
   /// In pixels.
   std::uint32_t width = 0;
+  /// In pixels.
   std::uint32_t height = 0;
   /// width * height * 3 bytes.
   std::vector<std::uint8_t> rgb;

@@ -11,7 +11,7 @@
 ///
 ///     LMRErrorRef error;
 ///     auto preview = LMRVideoPreview::previewWithCaptureSession_error(session, &error);
-///     ... some times a second:
+///     ...                                                         // some times a second
 ///     if (const auto picture = preview->takePicture(320, 180)) { ... picture->rgb ... }
 ///
 /// Any thread. A picture is converted only when one was asked for: as long as nobody takes any, the preview costs

@@ -3,9 +3,11 @@
 #include <LumoraKit/LumoraKit.h>
 
 #include <any>
+#include <cstdint>
 #include <functional>
 #include <memory>
 #include <string>
+#include <vector>
 
 namespace snippets {
 
@@ -180,6 +182,20 @@ void showLevels(const std::shared_ptr<lumora::CaptureSession>& session, Bar* bar
     bar->set(LMRLevelMeter::decibels(level.peak));
   }
   warning->setVisible(meter->secondsOfSilence() > 10);
+}
+
+struct Image {
+  void show(const std::vector<std::uint8_t>& rgb, std::uint32_t width, std::uint32_t height);
+};
+
+// LMRVideoPreview.h
+void showPictures(const std::shared_ptr<lumora::CaptureSession>& session, Image* image) {
+  LMRErrorRef error;
+  auto preview = LMRVideoPreview::previewWithCaptureSession_error(session, &error);
+  // Some times a second:
+  if (const auto picture = preview->takePicture(320, 180)) {
+    image->show(picture->rgb, picture->width, picture->height);
+  }
 }
 
 // LMRRecorderClasses.h
