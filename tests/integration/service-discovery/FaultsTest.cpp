@@ -5,6 +5,7 @@
 
 #include <glib.h>
 
+#include <chrono>
 #include <cstdlib>
 
 using lumora::tests::serveUntil;
@@ -169,6 +170,30 @@ TEST_F(BusFaultsTest, search_findsNothing_whenTheBusHasNoDaemon) {
   const auto browser = browse();
   EXPECT_TRUE(browser);
   EXPECT_FALSE(error_);
+}
+
+TEST_F(BusFaultsTest, descriptors_areGivenBack_atWhicheverMomentASearchEnds) {
+  if (const auto obstacle = lumora::tests::TestBus::obstacle()) {
+    GTEST_SKIP() << *obstacle;
+  }
+  keepNoUnusedThreads();
+  lumora::tests::TestBus bus(folder_.path());
+  ASSERT_TRUE(bus.start());
+  const auto searchFor = [&](std::chrono::microseconds time) {
+    const auto browser = browse();
+    ASSERT_TRUE(browser);
+    const auto end = std::chrono::steady_clock::now() + time;
+    serveUntil([&] { return std::chrono::steady_clock::now() >= end; });
+  };
+  searchFor(std::chrono::milliseconds(100));
+  const auto descriptors = lumora::tests::openDescriptors();
+  // From before the connection until after the bus has told that there is no daemon.
+  constexpr int moments = 200;
+  for (int moment = 0; moment < moments; ++moment) {
+    searchFor(std::chrono::microseconds(50) * moment);
+  }
+  EXPECT_TRUE(serveUntil([&] { return lumora::tests::openDescriptors() <= descriptors; }))
+      << lumora::tests::openDescriptors() << " descriptors, " << descriptors << " before";
 }
 
 TEST_F(BusFaultsTest, announcement_failsWithTheReason_whenThereIsNoBus) {

@@ -3,6 +3,7 @@
 #include <LumoraKit/platform/linux/avahi/ServiceInstance.h>
 
 #include <algorithm>
+#include <atomic>
 #include <utility>
 
 namespace lumora::backend {
@@ -28,6 +29,32 @@ GLibPtr<GDBusConnection> finishedConnection(GAsyncResult* result, std::string& r
   return connection;
 }
 
+struct Farewell {
+  GMainContext* const context;
+  std::atomic<bool> isOver{false};
+
+  // On whichever thread lets go of the connection last.
+  static void gone(gpointer farewell, GObject* /*connection*/) {
+    auto& self = *static_cast<Farewell*>(farewell);
+    GMainContext* const context = g_main_context_ref(self.context);
+    self.isOver = true; // and may not be there any more
+    g_main_context_wakeup(context);
+    g_main_context_unref(context);
+  }
+};
+
+// The library's own calls for a watched name may be under way. They and the connection keep each other until their ends
+// have been served here.
+void closeAndWait(GLibPtr<GDBusConnection> connection) {
+  Farewell farewell{g_main_context_get_thread_default()};
+  g_object_weak_ref(G_OBJECT(connection.get()), &Farewell::gone, &farewell);
+  g_dbus_connection_close(connection.get(), nullptr, nullptr, nullptr);
+  connection.reset();
+  while (!farewell.isOver) {
+    g_main_context_iteration(farewell.context, TRUE);
+  }
+}
+
 } // namespace
 
 AvahiDaemon::Dependent::~Dependent() = default;
@@ -45,7 +72,9 @@ void AvahiDaemon::end() {
   dependents_.clear();
   retry_.reset();
   g_cancellable_cancel(cancellable_.get());
-  disconnect();
+  if (GLibPtr<GDBusConnection> connection = disconnect(); connection) {
+    closeAndWait(std::move(connection));
+  }
   GMainContext* const context = g_main_context_get_thread_default();
   while (underWay_ > 0) {
     g_main_context_iteration(context, TRUE);
@@ -117,14 +146,13 @@ void AvahiDaemon::follow(GLibPtr<GDBusConnection> connection) {
                                           vanished, this, nullptr);
 }
 
-void AvahiDaemon::disconnect() {
-  if (!connection_) {
-    return;
+GLibPtr<GDBusConnection> AvahiDaemon::disconnect() {
+  if (connection_) {
+    g_bus_unwatch_name(std::exchange(watch_, 0));
+    g_signal_handler_disconnect(connection_.get(), std::exchange(closedHandler_, 0));
+    owner_.clear();
   }
-  g_bus_unwatch_name(std::exchange(watch_, 0));
-  g_signal_handler_disconnect(connection_.get(), std::exchange(closedHandler_, 0));
-  owner_.clear();
-  connection_.reset();
+  return std::move(connection_);
 }
 
 void AvahiDaemon::lostBus() {

@@ -62,7 +62,7 @@ private:
 
   void connect();
   void connectLater();
-  void disconnect();
+  GLibPtr<GDBusConnection> disconnect();
   void follow(GLibPtr<GDBusConnection> connection);
   void lostBus();
   void came(const char* owner);
