@@ -20,6 +20,14 @@ void show(const std::string& line) {
   }
 }
 
+void throwIfInterrupted() {
+  if (interrupted != 0) {
+    interrupted = 0;
+    show("");
+    throw Failure{"Cancelled.", 130};
+  }
+}
+
 } // namespace
 
 TemporaryHome::TemporaryHome() {
@@ -48,14 +56,11 @@ void catchInterrupts() {
 void waitUntil(const std::function<bool()>& condition, const std::function<std::string()>& progress,
                std::chrono::seconds limit) {
   using namespace std::chrono_literals;
+  throwIfInterrupted();
   const auto deadline = std::chrono::steady_clock::now() + limit;
   while (!lumora::Platform::current().mainThread->serveUntil(condition, 100ms)) {
     show(progress());
-    if (interrupted != 0) {
-      interrupted = 0;
-      show("");
-      throw Failure{"Cancelled.", 130};
-    }
+    throwIfInterrupted();
     if (std::chrono::steady_clock::now() > deadline) {
       throw Failure{"Nothing happened for " + std::to_string(limit.count()) + " seconds: " + progress()};
     }
