@@ -58,7 +58,7 @@ public:
   }
 
 private:
-  void keep(std::string selector, const Recorder& recorder, const LMRErrorRef& error = nullptr) {
+  void keep(const std::string& selector, const Recorder& recorder, const LMRErrorRef& error = nullptr) {
     {
       const std::lock_guard lock(mutex_);
       messages_.push_back({selector, recorder.get(), error, Platform::current().mainThread->isCurrent()});

@@ -73,6 +73,7 @@ TEST(ContendedJournal, givesEachNoteToOneProcess_andLeavesNothingBehind) {
     }
   }
   std::vector<pid_t> children;
+  children.reserve(processes);
   for (int i = 0; i < processes; ++i) {
     children.push_back(inChild([&, i] { closeAll(folder, temporary / std::to_string(i)); }));
   }
@@ -92,6 +93,7 @@ TEST(ContendedJournal, findsEveryNote_whenTheProcessesThatHadThemWereKilled) {
   const TemporaryFolder temporary;
   const auto folder = temporary / "notes";
   std::vector<pid_t> children;
+  children.reserve(processes);
   for (int i = 0; i < processes; ++i) {
     children.push_back(inChild([&folder] {
       const auto journal = LMRRecordingJournal::journalWithFolder_error(folder, nullptr);
