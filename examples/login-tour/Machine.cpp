@@ -31,22 +31,22 @@ Machine::Machine() {
   lumora::Platform::install(platform);
 }
 
-bool Machine::allows(const std::string& lack, const std::optional<std::string>& obstacle) {
+bool Machine::allows(const std::string& part, const std::optional<std::string>& obstacle) {
   if (obstacle) {
-    gaps_.push_back(lack + ": " + *obstacle + ".");
+    gaps_.push_back("Left out here: " + part + ", because " + *obstacle + ".");
   }
   return !obstacle;
 }
 
 void Machine::startKeyring() {
-  hasKeyring_ = allows("Passwords are not remembered", TestKeyring::obstacle());
+  hasKeyring_ = allows("remembering the password", TestKeyring::obstacle());
   if (hasKeyring_ && !keyring_.start()) {
     throw Failure{"The keyring does not start."};
   }
 }
 
 void Machine::startRealm() {
-  hasRealm_ = allows("There is no login by ticket", TestKDC::obstacle());
+  hasRealm_ = allows("the login by ticket", TestKDC::obstacle());
   if (!hasRealm_) {
     return;
   }
@@ -59,7 +59,7 @@ void Machine::startRealm() {
 }
 
 void Machine::announceServer() {
-  if (!allows("Servers are not found by themselves", TestAvahi::obstacle())) {
+  if (!allows("finding the server", TestAvahi::obstacle())) {
     return;
   }
   if (!network_.start()) {

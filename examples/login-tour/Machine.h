@@ -38,8 +38,8 @@ public:
   void getTicket();
 
 private:
-  /// Whether the machine has it: without an obstacle.
-  bool allows(const std::string& lack, const std::optional<std::string>& obstacle);
+  /// Whether there is no obstacle to this part of the demo; else it is a gap.
+  bool allows(const std::string& part, const std::optional<std::string>& obstacle);
   void startKeyring();
   void startRealm();
   void announceServer();

@@ -50,7 +50,7 @@ Tour::Tour(Machine& machine, Robot* robot) : machine_(machine), robot_(robot), l
 
 void Tour::run() {
   for (const std::string& gap : machine_.gaps()) {
-    std::cout << "Not to be seen on this machine: " << gap << '\n';
+    std::cout << gap << '\n';
   }
   runByPassword();
   if (machine_.hasRealm()) {
