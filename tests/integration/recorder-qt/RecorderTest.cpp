@@ -1,0 +1,159 @@
+#include "RecorderRig.h"
+
+#include <gmock/gmock.h>
+
+#include <QLabel>
+#include <QListWidget>
+#include <QPushButton>
+#include <filesystem>
+
+namespace recorder {
+namespace {
+
+using ::testing::IsEmpty;
+using ::testing::SizeIs;
+
+class RecorderWindowTest : public RecorderRig {
+protected:
+  bool hasPictures() {
+    return waitFor([&] {
+      for (const auto& source : studio().sources()) {
+        if (!source->picture()) {
+          return false;
+        }
+      }
+      return !studio().sources().empty();
+    });
+  }
+  bool hasSound() {
+    return waitFor([&] { return !studio().sources()[0]->levels().empty(); });
+  }
+  void recordForAWhile() {
+    press("record");
+    ASSERT_TRUE(isIn(TakeState::Recording));
+    ASSERT_TRUE(waitFor([&] { return studio().take()->elapsedTime() > 1; }));
+  }
+  bool hasSubmitted(std::size_t episodes) {
+    return waitFor([&] { return !studio().isUnderWay() && server_->episodes().size() == episodes; });
+  }
+};
+
+TEST_F(RecorderWindowTest, recordsCameraAndScreen_andSubmitsThem) {
+  open();
+  logIn();
+  ASSERT_TRUE(selectWorkflow("Camera and Screen"));
+  ASSERT_THAT(studio().sources(), SizeIs(2));
+  EXPECT_TRUE(hasPictures());
+  EXPECT_TRUE(hasSound());
+  type("title", "Waves");
+  type("description", "The second lecture.");
+  recordForAWhile();
+  press("pause");
+  ASSERT_TRUE(isIn(TakeState::Paused));
+  press("pause");
+  ASSERT_TRUE(isIn(TakeState::Recording));
+  press("stop");
+  ASSERT_TRUE(hasSubmitted(2)) << studio().notice();
+  EXPECT_EQ(server_->episodes().front().string("title"), "Waves");
+  EXPECT_EQ(studio().notice(), "");
+  EXPECT_TRUE(waitFor([&] { return studio().submissions().waiting().empty(); }));
+  EXPECT_TRUE(waitFor([&] { return studio().canRecord(); }));
+}
+
+TEST_F(RecorderWindowTest, showsALostCamera_andSubmitsWhatThereIs) {
+  open();
+  logIn();
+  ASSERT_TRUE(selectWorkflow("Camera and Screen"));
+  recordForAWhile();
+  ASSERT_TRUE(desktop().devices->remove("lumora_camera"));
+  ASSERT_TRUE(waitFor([&] { return studio().sources()[0]->state() == SourceState::Failed; }));
+  EXPECT_EQ(studio().sources()[1]->state(), SourceState::Recording);
+  EXPECT_NE(studio().notice(), "");
+  press("stop");
+  ASSERT_TRUE(hasSubmitted(2)) << studio().notice();
+  EXPECT_FALSE(studio().canRecord());
+  ASSERT_TRUE(desktop().devices->add("camera", "lumora_camera"));
+  EXPECT_TRUE(waitFor([&] { return studio().canRecord(); }));
+}
+
+TEST_F(RecorderWindowTest, keepsASubmissionThatFails_andSubmitsItOnRequest) {
+  open();
+  logIn();
+  ASSERT_TRUE(selectWorkflow("Single Video"));
+  server_->administrate({"inject", "failure"}, {"--command", "submit", "--status", "20"});
+  recordForAWhile();
+  press("stop");
+  ASSERT_TRUE(waitFor([&] {
+    const auto waiting = studio().submissions().waiting();
+    return waiting.size() == 1 && waiting.front().lastError;
+  }));
+  server_->administrate({"inject", "clear"});
+  ASSERT_TRUE(waitFor([&] { return find<QListWidget>("submissions")->item(0)->flags() != Qt::NoItemFlags; }));
+  find<QListWidget>("submissions")->item(0)->setSelected(true);
+  press("submitNow");
+  EXPECT_TRUE(hasSubmitted(1));
+}
+
+TEST_F(RecorderWindowTest, asksBeforeItCloses_whileItRecords) {
+  open();
+  logIn();
+  ASSERT_TRUE(selectWorkflow("Single Video"));
+  recordForAWhile();
+  answer("Keep Recording");
+  EXPECT_FALSE(window_->close());
+  EXPECT_EQ(answers(), 1);
+  EXPECT_TRUE(isIn(TakeState::Recording));
+  answer("Stop and Submit");
+  EXPECT_FALSE(window_->close());
+  EXPECT_TRUE(waitFor([&] { return !window_->isVisible(); }));
+  EXPECT_THAT(server_->episodes(), SizeIs(1));
+}
+
+TEST_F(RecorderWindowTest, discardsTheRecording_afterAQuestion) {
+  open();
+  logIn();
+  ASSERT_TRUE(selectWorkflow("Screen Recording"));
+  recordForAWhile();
+  answer("Discard");
+  press("cancel");
+  EXPECT_TRUE(waitFor([&] { return !studio().isUnderWay(); }));
+  EXPECT_EQ(answers(), 1);
+  EXPECT_TRUE(waitFor([&] { return studio().canRecord(); }));
+  for (const auto& entry : std::filesystem::recursive_directory_iterator(home_->path())) {
+    EXPECT_NE(entry.path().extension(), ".mov") << entry.path();
+  }
+  EXPECT_THAT(server_->episodes(), IsEmpty());
+}
+
+// The window goes in the midst of a recording, and with it the journal, as if the program had died.
+TEST_F(RecorderWindowTest, offersAnInterruptedRecording_andSubmitsIt) {
+  open();
+  logIn();
+  ASSERT_TRUE(selectWorkflow("Single Video"));
+  type("title", "Interrupted");
+  recordForAWhile();
+  window_.reset();
+  open();
+  answer("Submit");
+  logIn();
+  EXPECT_TRUE(waitFor([&] { return answers() == 1; }));
+  ASSERT_TRUE(hasSubmitted(1)) << report();
+  EXPECT_EQ(server_->episodes().front().string("title"), "Interrupted");
+}
+
+TEST_F(RecorderWindowTest, givesEverythingAName) {
+  open();
+  logIn();
+  for (const QWidget* const widget : window_->findChildren<QWidget*>()) {
+    const bool isReached =
+        (widget->focusPolicy() & Qt::TabFocus) != 0 && widget->isVisible() && !widget->objectName().startsWith("qt_");
+    const auto* const button = qobject_cast<const QAbstractButton*>(widget);
+    if (isReached) {
+      EXPECT_TRUE(!widget->accessibleName().isEmpty() || (button && !button->text().isEmpty()))
+          << widget->metaObject()->className() << " " << widget->objectName().toStdString();
+    }
+  }
+}
+
+} // namespace
+} // namespace recorder
