@@ -1,7 +1,7 @@
 #pragma once
 
+#include "Desktop.h"
 #include "recorder/window/RecorderWindow.h"
-#include "support/HeadlessDevices.h"
 #include "support/Sandbox.h"
 #include "support/TemporaryFolder.h"
 
@@ -17,13 +17,6 @@
 #include <string>
 
 namespace recorder {
-
-/// The devices of all tests, and why there are none.
-struct Desktop {
-  std::unique_ptr<lumora::testing::HeadlessDevices> devices;
-  std::string missing;
-};
-Desktop& desktop();
 
 /// The recorder's window with real devices and a server of its own, driven by keys and buttons.
 class RecorderRig : public ::testing::Test {

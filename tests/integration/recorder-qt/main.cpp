@@ -1,5 +1,4 @@
-// GLib's headers use a name that is a word of Qt's: they go first.
-#include "RecorderRig.h"
+#include "Desktop.h"
 #include "support/ChildProgram.h"
 
 #include <LumoraKit/LumoraKit.h>
