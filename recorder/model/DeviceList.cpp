@@ -12,8 +12,8 @@ SourceDescriptions described(SourceKind kind, const LMRCaptureDeviceAdditions::D
   for (const auto& device : devices) {
     descriptions.push_back({kind, device->uniqueID(), device->localizedDisplayName()});
   }
-  std::ranges::stable_partition(
-      descriptions, [&](const SourceDescription& each) { return first && each.identifier == first->uniqueID(); });
+  std::stable_partition(descriptions.begin(), descriptions.end(),
+                        [&](const SourceDescription& each) { return first && each.identifier == first->uniqueID(); });
   return descriptions;
 }
 

@@ -7,7 +7,8 @@ namespace recorder {
 namespace {
 
 void putFirst(SourceDescriptions& sources, const std::string& identifier) {
-  std::ranges::stable_partition(sources, [&](const SourceDescription& each) { return each.identifier == identifier; });
+  std::stable_partition(sources.begin(), sources.end(),
+                        [&](const SourceDescription& each) { return each.identifier == identifier; });
 }
 
 bool contains(const SourceDescriptions& sources, const SourceDescription& source) {
