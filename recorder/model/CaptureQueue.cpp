@@ -47,7 +47,7 @@ Session sessionOf(const PlannedSource& plan, const Device& microphone, LMRErrorR
 } // namespace
 
 std::shared_ptr<lumora::WorkQueue> captureQueue() {
-  static const auto label = "org.vantor.lumora.recorder.capture";
+  constexpr const char* label = "org.vantor.lumora.recorder.capture";
   static std::weak_ptr<lumora::Queues> owner;
   static std::shared_ptr<lumora::WorkQueue> queue;
   const auto queues = lumora::Platform::current().queues;

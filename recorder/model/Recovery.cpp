@@ -56,7 +56,7 @@ void Recovery::find(const std::shared_ptr<LMRSession>& session) {
 }
 
 // Those of others wait for them; what is of no use is forgotten.
-void Recovery::take(Recordings found, const LMRSession& session) {
+void Recovery::take(const Recordings& found, const LMRSession& session) {
   for (const auto& recording : found) {
     if (!recording->isUsable()) {
       recording->keep();

@@ -49,7 +49,7 @@ public:
 private:
   using Recordings = std::vector<std::shared_ptr<LMRUnfinishedRecording>>;
 
-  void take(Recordings found, const LMRSession& session);
+  void take(const Recordings& found, const LMRSession& session);
   void done(LMRErrorRef error);
 
   std::shared_ptr<LMRRecordingJournal> journal_;

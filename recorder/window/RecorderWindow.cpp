@@ -20,9 +20,9 @@ constexpr int sidebarCharacters = 34;
 
 RecorderWindow::RecorderWindow()
     : studio_(Studio::make()),
-      login_(std::make_shared<LoginFlow>([this](const std::shared_ptr<LMRSession>& session) { loggedIn(session); })) {
+      login_(std::make_shared<LoginFlow>([this](const std::shared_ptr<LMRSession>& session) { loggedIn(session); })),
+      pages_(new QStackedWidget(this)) {
   setWindowTitle("Lumora Recorder");
-  pages_ = new QStackedWidget(this);
   pages_->addWidget(buildWelcome());
   pages_->addWidget(buildRecorder());
   setCentralWidget(pages_);

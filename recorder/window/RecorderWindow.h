@@ -61,7 +61,7 @@ private:
   bool wasUnderWay_ = false;
   bool isAskingAboutServer_ = false;
   bool isAskingAboutInterrupted_ = false;
-  QStackedWidget* pages_ = nullptr;
+  QStackedWidget* const pages_;
   NoticeBar* notice_ = nullptr;
   QLabel* empty_ = nullptr;
   QHBoxLayout* cardRow_ = nullptr;

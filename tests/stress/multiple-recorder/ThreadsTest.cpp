@@ -83,13 +83,17 @@ TEST_P(MultipleRecorderThreads, aFailureIsToldOnce_whenSeveralSourcesFailAtOnce)
 }
 
 TEST_P(MultipleRecorderThreads, messagesComeOneAtATimeOnTheMainThread_whenThreeThreadsRequestWhatTheyLike) {
-  bool isInside = false;
-  bool overlapped = false;
-  delegate_->onMessage = [&](const std::string&) {
-    overlapped = overlapped || isInside;
-    isInside = true;
+  struct Watch {
+    bool isInside = false;
+    bool overlapped = false;
+  };
+  // The last messages may come when the test is over.
+  const auto watch = std::make_shared<Watch>();
+  delegate_->onMessage = [watch](const std::string&) {
+    watch->overlapped = watch->overlapped || watch->isInside;
+    watch->isInside = true;
     std::this_thread::yield();
-    isInside = false;
+    watch->isInside = false;
   };
   const auto recorder = newRecorder();
   std::atomic<int> done = 0;
@@ -119,7 +123,7 @@ TEST_P(MultipleRecorderThreads, messagesComeOneAtATimeOnTheMainThread_whenThreeT
   // The answers still on their way are told before the last one.
   recorder->cancel();
   ASSERT_TRUE(serveUntil([&] { return recorder->isCancelled(); }));
-  EXPECT_FALSE(overlapped);
+  EXPECT_FALSE(watch->overlapped);
   for (const auto& message : delegate_->messages()) {
     EXPECT_TRUE(message.wasOnMainThread);
   }
