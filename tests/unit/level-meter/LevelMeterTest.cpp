@@ -1,3 +1,5 @@
+#include "support/CameraAndMicrophone.h"
+
 #include <LumoraKit/recording/LMRLevelMeter.h>
 #include <LumoraKit/testing/FakeCaptureDevice.h>
 #include <LumoraKit/testing/FakeCaptureSession.h>
@@ -21,16 +23,8 @@ constexpr lumora::HostTime second = 1'000'000'000;
 class LevelMeter : public testing::Test {
 protected:
   LevelMeter() {
-    auto& capture = *platform_.mediaCapture;
-    for (const auto& [name, type] :
-         {std::pair("microphone", MediaType::Sound), std::pair("camera", MediaType::Video)}) {
-      const auto device = capture.addDevice(name, {type});
-      device->open();
-      session_->addInput(capture.makeDeviceInput(device));
-    }
-    session_->startRunning();
     meter_ = LMRLevelMeter::meterWithCaptureSession_error(session_, nullptr);
-    output_ = capture.movieFileOutputs().back();
+    output_ = platform_.mediaCapture->movieFileOutputs().back();
   }
 
   // One sample on the connection of that type, at the present moment.
@@ -45,7 +39,8 @@ protected:
   }
 
   lumora::fakes::FakePlatform platform_;
-  std::shared_ptr<lumora::CaptureSession> session_ = platform_.mediaCapture->makeSession();
+  std::shared_ptr<lumora::CaptureSession> session_ =
+      lumora::tests::runningSessionOfCameraAndMicrophone(*platform_.mediaCapture);
   std::shared_ptr<lumora::fakes::FakeMovieFileOutput> output_;
   std::unique_ptr<LMRLevelMeter> meter_;
 };

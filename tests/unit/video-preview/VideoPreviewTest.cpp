@@ -1,3 +1,5 @@
+#include "support/CameraAndMicrophone.h"
+
 #include <LumoraKit/recording/LMRVideoPreview.h>
 #include <LumoraKit/testing/FakeCaptureDevice.h>
 #include <LumoraKit/testing/FakeCaptureErrors.h>
@@ -22,16 +24,8 @@ const Picture green{1, 1, {0, 255, 0}};
 class VideoPreview : public testing::Test {
 protected:
   VideoPreview() {
-    auto& capture = *platform_.mediaCapture;
-    for (const auto& [name, type] :
-         {std::pair("microphone", MediaType::Sound), std::pair("camera", MediaType::Video)}) {
-      const auto device = capture.addDevice(name, {type});
-      device->open();
-      session_->addInput(capture.makeDeviceInput(device));
-    }
-    session_->startRunning();
     preview_ = LMRVideoPreview::previewWithCaptureSession_error(session_, nullptr);
-    output_ = capture.movieFileOutputs().back();
+    output_ = platform_.mediaCapture->movieFileOutputs().back();
   }
 
   // One sample on the connection of that type; how often it was looked into.
@@ -46,7 +40,8 @@ protected:
   }
 
   lumora::fakes::FakePlatform platform_;
-  std::shared_ptr<lumora::CaptureSession> session_ = platform_.mediaCapture->makeSession();
+  std::shared_ptr<lumora::CaptureSession> session_ =
+      lumora::tests::runningSessionOfCameraAndMicrophone(*platform_.mediaCapture);
   std::shared_ptr<lumora::fakes::FakeMovieFileOutput> output_;
   std::unique_ptr<LMRVideoPreview> preview_;
 };
