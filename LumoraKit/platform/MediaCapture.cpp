@@ -19,6 +19,10 @@ std::optional<Picture> SampleBuffer::picture(std::uint32_t, std::uint32_t) const
   return std::nullopt;
 }
 
+std::vector<MediaEncoder> MediaCapture::encoders(const std::string&) {
+  return {};
+}
+
 void MovieFileOutput::recordToOutputFileURL_atHostTime(const std::filesystem::path& file, HostTime) {
   recordToOutputFileURL(file);
 }

@@ -104,8 +104,23 @@ struct CompressionOptions {
   std::optional<std::uint32_t> width;
   /// Video only, the height in pixels: with a width, or neither.
   std::optional<std::uint32_t> height;
+  /// The identifier of an encoder of the codec, see MediaCapture::encoders(). One that does not work here (any more) is
+  /// logged, and the framework's choice takes its place: a recording never fails for it.
+  std::optional<std::string> encoder = std::nullopt;
 
   friend bool operator==(const CompressionOptions&, const CompressionOptions&) = default;
+};
+
+/// An encoder of this machine, for a user to choose from.
+struct MediaEncoder {
+  /// For CompressionOptions::encoder; the same after a restart of the machine.
+  std::string identifier;
+  /// For the user: a proper name, the same in all languages.
+  std::string name;
+  /// Whether the graphics card or the processor has a unit for it.
+  bool isHardware = false;
+
+  friend bool operator==(const MediaEncoder&, const MediaEncoder&) = default;
 };
 
 /// How loud one channel of a sound buffer is; 1 is full scale.
@@ -280,6 +295,11 @@ public:
 
   /// The host clock now.
   virtual HostTime hostTime() const = 0;
+
+  /// The encoders of a codec of CompressionOptions that work on this machine; the one that the framework chooses by
+  /// itself is the first. They are tried out when asked for the first time, which blocks for 3 seconds each at most.
+  /// Without a definition of its own a capture system names none.
+  virtual std::vector<MediaEncoder> encoders(const std::string& codec);
 };
 
 } // namespace lumora

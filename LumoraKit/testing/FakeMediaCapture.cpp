@@ -60,6 +60,16 @@ HostTime FakeMediaCapture::hostTime() const {
   return hostTime_;
 }
 
+std::vector<MediaEncoder> FakeMediaCapture::encoders(const std::string&) {
+  const std::lock_guard lock(mutex_);
+  return encoders_;
+}
+
+void FakeMediaCapture::setEncoders(std::vector<MediaEncoder> encoders) {
+  const std::lock_guard lock(mutex_);
+  encoders_ = std::move(encoders);
+}
+
 std::shared_ptr<FakeCaptureDevice> FakeMediaCapture::addDevice(std::string uniqueID, std::vector<MediaType> types) {
   const std::lock_guard lock(mutex_);
   return devices_.emplace_back(std::make_shared<FakeCaptureDevice>(std::move(uniqueID), std::move(types)));

@@ -34,6 +34,8 @@ public:
   std::shared_ptr<CaptureSession> makeSession() override;
   std::shared_ptr<MovieFileOutput> makeMovieFileOutput() override;
   HostTime hostTime() const override;
+  /// Those that were set, for any codec.
+  std::vector<MediaEncoder> encoders(const std::string& codec) override;
 
   /// Plugs a device in that delivers these types. The first one of a type is its default device.
   std::shared_ptr<FakeCaptureDevice> addDevice(std::string uniqueID, std::vector<MediaType> types);
@@ -50,6 +52,9 @@ public:
   void failToAddOutput(LMRErrorRef error);
   /// The same for the start of the session.
   void failToStart(LMRErrorRef error);
+
+  /// The encoders that work from now on; at first none.
+  void setEncoders(std::vector<MediaEncoder> encoders);
 
   /// Sets the clock, in either direction.
   void setHostTime(HostTime time);
@@ -70,6 +75,7 @@ private:
   LMRErrorRef screenError_;
   LMRErrorRef outputError_;
   LMRErrorRef startError_;
+  std::vector<MediaEncoder> encoders_;
   HostTime hostTime_ = 0;
 };
 

@@ -33,6 +33,18 @@ void DeviceList::refresh() {
   });
 }
 
+void DeviceList::findEncoders() {
+  lumora::Platform::current().queues->concurrentQueue()->async([weak = weak_from_this()] {
+    auto encoders = lumora::Platform::current().mediaCapture->encoders("h264");
+    lumora::Platform::current().queues->mainQueue()->async([weak, encoders = std::move(encoders)] {
+      if (const auto self = weak.lock()) {
+        self->encoders_ = encoders;
+        self->changed.notify();
+      }
+    });
+  });
+}
+
 DeviceList::Found DeviceList::look() {
   using namespace LMRCaptureDeviceAdditions;
   auto& capture = *lumora::Platform::current().mediaCapture;

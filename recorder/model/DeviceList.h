@@ -5,6 +5,7 @@
 #include <LumoraKit/LumoraKit.h>
 
 #include <memory>
+#include <vector>
 
 namespace recorder {
 
@@ -16,12 +17,16 @@ public:
 
   /// Looks on a worker, unless it is looking already.
   void refresh();
+  /// Tries on a worker which encoders work.
+  void findEncoders();
   /// False until the first look has ended.
   bool isKnown() const { return isKnown_; }
   /// The default one first.
   const SourceDescriptions& cameras() const { return found_.cameras; }
   const SourceDescriptions& microphones() const { return found_.microphones; }
   bool hasScreen() const { return found_.hasScreen; }
+  /// For pictures, the framework's choice first; none before they were tried.
+  const std::vector<lumora::MediaEncoder>& encoders() const { return encoders_; }
 
 private:
   struct Found {
@@ -38,6 +43,7 @@ private:
   bool isLooking_ = false;
   bool isKnown_ = false;
   Found found_;
+  std::vector<lumora::MediaEncoder> encoders_;
 };
 
 } // namespace recorder

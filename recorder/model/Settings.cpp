@@ -6,6 +6,7 @@ namespace recorder {
 namespace {
 
 constexpr std::string_view qualityKey = "RecorderQuality";
+constexpr std::string_view encoderKey = "RecorderEncoder";
 constexpr std::string_view cameraKey = "RecorderCamera";
 constexpr std::string_view microphoneKey = "RecorderMicrophone";
 constexpr std::string_view workflowKey = "RecorderWorkflow";
@@ -47,6 +48,7 @@ Settings Settings::load() {
   for (const QualityName& each : qualities) {
     settings.quality = each.name == name ? each.quality : settings.quality;
   }
+  settings.encoder = stored(encoderKey);
   settings.camera = stored(cameraKey);
   settings.microphone = stored(microphoneKey);
   settings.workflow = stored(workflowKey);
@@ -60,20 +62,23 @@ void Settings::save() const {
       store(qualityKey, std::string(each.name));
     }
   }
+  store(encoderKey, encoder);
   store(cameraKey, camera);
   store(microphoneKey, microphone);
   store(workflowKey, workflow);
 }
 
 std::optional<lumora::CompressionOptions> Settings::videoCompression() const {
+  lumora::CompressionOptions options;
   for (const QualityName& each : qualities) {
     if (each.quality == quality && each.bitRate != 0) {
-      lumora::CompressionOptions options;
       options.bitRate = each.bitRate;
-      return options;
     }
   }
-  return std::nullopt;
+  if (!encoder.empty()) {
+    options.encoder = encoder;
+  }
+  return options == lumora::CompressionOptions() ? std::nullopt : std::optional(options);
 }
 
 } // namespace recorder

@@ -16,6 +16,8 @@ struct Settings {
   /// Where recordings go; nothing: the framework's folder.
   std::optional<std::filesystem::path> folder;
   Quality quality = Quality::Standard;
+  /// Identifier of the encoder for pictures; empty: the framework's choice.
+  std::string encoder;
   /// Identifiers of the devices to begin with; empty: the system's defaults.
   std::string camera;
   std::string microphone;

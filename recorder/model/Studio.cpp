@@ -35,6 +35,7 @@ void Studio::begin() {
   connections_.push_back(recovery_->changed.observe([this] { recoveryChanged(); }));
   recovery_->open();
   devices_->refresh();
+  devices_->findEncoders();
 }
 
 // The error is told at once when a take is to be noted.
@@ -57,7 +58,7 @@ void Studio::reloadCatalogue() {
   changed.notify();
 }
 
-// Folder and quality count for recorders that are made from now on.
+// Folder, quality and encoder count for recorders that are made from now on.
 void Studio::setSettings(const Settings& settings) {
   settings_ = settings;
   settings_.save();

@@ -14,12 +14,13 @@ namespace recorder {
 
 SettingsDialog::SettingsDialog(const Studio& studio, QWidget* parent)
     : QDialog(parent), studio_(studio), folder_(new QLineEdit(this)), quality_(new QComboBox(this)),
-      camera_(new QComboBox(this)), microphone_(new QComboBox(this)) {
+      encoder_(new QComboBox(this)), camera_(new QComboBox(this)), microphone_(new QComboBox(this)) {
   setWindowTitle(words("Settings"));
   build();
   const Settings& now = studio.settings();
   folder_->setText(now.folder ? QString::fromStdString(now.folder->string()) : QString());
   quality_->setCurrentIndex(quality_->findData(static_cast<int>(now.quality)));
+  fillEncoders(now.encoder);
   fillDevices(*camera_, studio.devices().cameras(), now.camera);
   fillDevices(*microphone_, studio.devices().microphones(), now.microphone);
 }
@@ -38,6 +39,7 @@ void SettingsDialog::build() {
   quality_->addItem(words("Small files"), static_cast<int>(Quality::Small));
   quality_->addItem(words("Standard"), static_cast<int>(Quality::Standard));
   quality_->addItem(words("High"), static_cast<int>(Quality::High));
+  encoder_->setObjectName("encoder");
   camera_->setObjectName("defaultCamera");
   microphone_->setObjectName("defaultMicrophone");
   auto* const form = new QFormLayout;
@@ -49,6 +51,7 @@ void SettingsDialog::build() {
   };
   add("&Folder for recordings:", folder_, folderRow);
   add("&Quality:", quality_, quality_);
+  add("&Encoder:", encoder_, encoder_);
   add("&Camera:", camera_, camera_);
   add("&Microphone:", microphone_, microphone_);
   auto* const buttons = new QDialogButtonBox(this);
@@ -59,6 +62,21 @@ void SettingsDialog::build() {
   auto* const layout = new QVBoxLayout(this);
   layout->addLayout(form);
   layout->addWidget(buttons);
+}
+
+// One that does not work at the moment stays chosen.
+void SettingsDialog::fillEncoders(const std::string& chosen) {
+  encoder_->addItem(words("Automatic"), QString());
+  for (const lumora::MediaEncoder& each : studio_.devices().encoders()) {
+    const QString name = QString::fromStdString(each.name);
+    encoder_->addItem(each.isHardware ? words("%1 (hardware)").arg(name) : name,
+                      QString::fromStdString(each.identifier));
+  }
+  const QString identifier = QString::fromStdString(chosen);
+  if (encoder_->findData(identifier) < 0) {
+    encoder_->addItem(words("%1 (not available)").arg(identifier), identifier);
+  }
+  encoder_->setCurrentIndex(encoder_->findData(identifier));
 }
 
 // One that is not connected at the moment stays chosen.
@@ -86,6 +104,7 @@ Settings SettingsDialog::settings() const {
   const std::string folder = folder_->text().trimmed().toStdString();
   settings.folder = folder.empty() ? std::nullopt : std::optional<std::filesystem::path>(folder);
   settings.quality = static_cast<Quality>(quality_->currentData().toInt());
+  settings.encoder = encoder_->currentData().toString().toStdString();
   settings.camera = camera_->currentData().toString().toStdString();
   settings.microphone = microphone_->currentData().toString().toStdString();
   return settings;

@@ -6,6 +6,7 @@
 
 #include <QApplication>
 #include <QComboBox>
+#include <QDialog>
 #include <QLineEdit>
 #include <QMessageBox>
 #include <QPlainTextEdit>
@@ -151,6 +152,20 @@ void RecorderRig::answer(const QString& button) {
     }
   });
   timer->start(20);
+}
+
+void RecorderRig::chooseInSettings(const char* comboBox, const std::string& data) {
+  auto* const timer = new QTimer(window_.get());
+  QObject::connect(timer, &QTimer::timeout, window_.get(), [timer, comboBox, data] {
+    if (auto* const dialog = qobject_cast<QDialog*>(QApplication::activeModalWidget())) {
+      timer->deleteLater();
+      auto* const box = dialog->findChild<QComboBox*>(comboBox);
+      box->setCurrentIndex(box->findData(QString::fromStdString(data)));
+      dialog->accept();
+    }
+  });
+  timer->start(20);
+  QTest::keyClick(window_.get(), Qt::Key_Comma, Qt::ControlModifier);
 }
 
 } // namespace recorder

@@ -39,6 +39,8 @@ protected:
   void type(const char* field, const QString& text);
   /// Presses the button of the question that comes next, as soon as it is there.
   void answer(const QString& button);
+  /// Opens the settings, chooses the entry with that data in a combo box, and accepts them.
+  void chooseInSettings(const char* comboBox, const std::string& data);
   /// What was answered.
   int answers() const { return answers_; }
   Studio& studio() { return *window_->studio(); }

@@ -6,6 +6,7 @@
 #include <QListWidget>
 #include <QPushButton>
 #include <filesystem>
+#include <string>
 
 namespace recorder {
 namespace {
@@ -32,6 +33,10 @@ protected:
     press("record");
     ASSERT_TRUE(isIn(TakeState::Recording));
     ASSERT_TRUE(waitFor([&] { return studio().take()->elapsedTime() > 1; }));
+  }
+  static std::string contentOf(const lumora::Dictionary& episode) {
+    const auto& file = *episode.array("files")->at(0).dictionary();
+    return lumora::tests::contentOf(file.string("path").value());
   }
   bool hasSubmitted(std::size_t episodes) {
     return waitFor([&] { return !studio().isUnderWay() && server_->episodes().size() == episodes; });
@@ -123,6 +128,23 @@ TEST_F(RecorderWindowTest, discardsTheRecording_afterAQuestion) {
     EXPECT_NE(entry.path().extension(), ".mov") << entry.path();
   }
   EXPECT_THAT(server_->episodes(), IsEmpty());
+}
+
+TEST_F(RecorderWindowTest, recordsWithTheEncoderOfTheSettings) {
+  open();
+  logIn();
+  ASSERT_TRUE(selectWorkflow("Single Video"));
+  ASSERT_TRUE(waitFor([&] { return !studio().devices().encoders().empty(); }));
+  const std::string last = studio().devices().encoders().back().identifier;
+  chooseInSettings("encoder", last);
+  EXPECT_EQ(studio().settings().encoder, last);
+  ASSERT_TRUE(waitFor([&] { return studio().canRecord(); }));
+  recordForAWhile();
+  press("stop");
+  ASSERT_TRUE(hasSubmitted(1)) << studio().notice();
+  // One of them writes its name into the pictures.
+  const auto isNamed = contentOf(server_->episodes().front()).find("x264 - core") != std::string::npos;
+  EXPECT_EQ(isNamed, studio().devices().encoders().back().name == "x264");
 }
 
 // The window goes in the midst of a recording, and with it the journal, as if the program had died.

@@ -306,6 +306,7 @@ TEST_F(StudioTest, keepsItsSettings) {
   Settings settings = studio_->settings();
   settings.folder = "/home/user/Films";
   settings.quality = Quality::High;
+  settings.encoder = "some-encoder";
   platform_.files->createDirectory(*settings.folder);
   studio_->setSettings(settings);
   queues_->runAll();
@@ -313,6 +314,25 @@ TEST_F(StudioTest, keepsItsSettings) {
   const auto recorder = std::dynamic_pointer_cast<LMRLocalVideoRecorder>(studio_->sources()[0]->recorder());
   EXPECT_EQ(recorder->outputFileURL()->parent_path(), *settings.folder);
   EXPECT_EQ(recorder->videoCompressionOptions()->bitRate, 8'000'000U);
+  EXPECT_EQ(recorder->videoCompressionOptions()->encoder, "some-encoder");
+}
+
+TEST_F(StudioTest, leavesTheEncoderToTheFramework_unlessOneWasChosen) {
+  platform_.mediaCapture->setEncoders({{"fast", "Fast", true}, {"slow", "Slow", false}});
+  begin();
+  const auto compression = [&] {
+    return std::dynamic_pointer_cast<LMRLocalVideoRecorder>(studio_->sources()[0]->recorder())
+        ->videoCompressionOptions();
+  };
+  EXPECT_EQ(studio_->devices().encoders().size(), 2U);
+  EXPECT_FALSE(compression());
+  Settings settings = studio_->settings();
+  settings.encoder = "slow";
+  studio_->setSettings(settings);
+  queues_->runAll();
+  ASSERT_TRUE(compression());
+  EXPECT_EQ(compression()->encoder, "slow");
+  EXPECT_FALSE(compression()->bitRate);
 }
 
 TEST_F(StudioTest, notesATakeOnDisk_whileItIsUnderWay) {

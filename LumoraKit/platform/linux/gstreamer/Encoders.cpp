@@ -1,7 +1,9 @@
+#include <LumoraKit/platform/Log.h>
 #include <LumoraKit/platform/linux/gstreamer/Encoders.h>
 #include <LumoraKit/platform/linux/gstreamer/GstPtr.h>
 #include <LumoraKit/platform/linux/gstreamer/Worker.h>
 
+#include <algorithm>
 #include <array>
 #include <string_view>
 
@@ -13,20 +15,21 @@ constexpr std::chrono::seconds patience{3};
 // In the order of preference. The delays of the sound encoders were measured with clicks. Without scenecut: each key
 // picture ends a fragment of the file, and a restless picture would make a dozen a second.
 constexpr std::array candidates{
-    Encoder{"h264", MediaType::Video, "vah264enc",
+    Encoder{"h264", MediaType::Video, "vah264enc", "VA-API", true,
             "vah264enc b-frames=0 key-int-max=GOP bitrate=KBITS ! video/x-h264,profile=high ! h264parse", "NV12", 0},
-    Encoder{"h264", MediaType::Video, "nvh264enc",
+    Encoder{"h264", MediaType::Video, "nvh264enc", "NVENC", true,
             "nvh264enc zerolatency=true gop-size=GOP bitrate=KBITS ! video/x-h264,profile=high ! h264parse", "NV12", 0},
-    Encoder{"h264", MediaType::Video, "x264enc",
+    Encoder{"h264", MediaType::Video, "x264enc", "x264", false,
             "x264enc speed-preset=superfast tune=zerolatency key-int-max=GOP option-string=scenecut=0 bitrate=KBITS ! "
             "video/x-h264,profile=high ! h264parse",
             "I420", 0},
-    Encoder{"h264", MediaType::Video, "openh264enc", "openh264enc complexity=low gop-size=GOP bitrate=BITS ! h264parse",
-            "I420", 0},
-    Encoder{"mjpeg", MediaType::Video, "jpegenc", "jpegenc", "I420", 0},
-    Encoder{"aac", MediaType::Sound, "avenc_aac", "avenc_aac bitrate=BITS ! aacparse", "F32LE", 1024},
-    Encoder{"aac", MediaType::Sound, "voaacenc", "voaacenc bitrate=BITS ! aacparse", "S16LE", 1600},
-    Encoder{"pcm", MediaType::Sound, "", "identity", "S16LE", 0},
+    Encoder{"h264", MediaType::Video, "openh264enc", "OpenH264", false,
+            "openh264enc complexity=low gop-size=GOP bitrate=BITS ! h264parse", "I420", 0},
+    Encoder{"mjpeg", MediaType::Video, "jpegenc", "JPEG", false, "jpegenc", "I420", 0},
+    Encoder{"aac", MediaType::Sound, "avenc_aac", "libavcodec", false, "avenc_aac bitrate=BITS ! aacparse", "F32LE",
+            1024},
+    Encoder{"aac", MediaType::Sound, "voaacenc", "VisualOn", false, "voaacenc bitrate=BITS ! aacparse", "S16LE", 1600},
+    Encoder{"pcm", MediaType::Sound, "", "PCM", false, "identity", "S16LE", 0},
 };
 
 void replace(std::string& text, std::string_view word, std::uint32_t number) {
@@ -68,17 +71,46 @@ std::string Encoder::launchLine(std::uint32_t bitRate, std::uint32_t keyInterval
   return line;
 }
 
-const Encoder* Encoders::find(MediaType type, const std::string& codec) {
-  const std::lock_guard lock(mutex_);
-  if (const auto known = found_.find(codec); known != found_.end()) {
-    return known->second && known->second->type == type ? known->second : nullptr;
+const Encoder* Encoders::find(MediaType type, const std::string& codec, const std::optional<std::string>& wanted) {
+  const auto fits = [&](const Encoder& each) { return each.type == type && each.codec == codec; };
+  if (wanted) {
+    const auto* const named =
+        std::ranges::find_if(candidates, [&](const Encoder& each) { return fits(each) && each.element == *wanted; });
+    if (named != candidates.end() && works(*named)) {
+      return named;
+    }
+    log("The encoder %@ does not work here, another one is taken", {*wanted});
   }
-  for (const Encoder& encoder : candidates) {
-    if (encoder.type == type && encoder.codec == codec && tryOut(encoder)) {
-      return found_[codec] = &encoder;
+  const auto* const first =
+      std::ranges::find_if(candidates, [&](const Encoder& each) { return fits(each) && works(each); });
+  if (first != candidates.end()) {
+    return first;
+  }
+  forgetFailures();
+  return nullptr;
+}
+
+std::vector<MediaEncoder> Encoders::list(const std::string& codec) {
+  std::vector<MediaEncoder> working;
+  for (const Encoder& each : candidates) {
+    if (each.codec == codec && works(each)) {
+      working.push_back({each.element, each.name, each.isHardware});
     }
   }
-  return nullptr;
+  return working;
+}
+
+// The lock is held for one trial only: a recording that is about to begin does not wait for the end of a list.
+bool Encoders::works(const Encoder& encoder) {
+  const std::lock_guard lock(mutex_);
+  const auto known = tried_.find(&encoder);
+  return known != tried_.end() ? known->second : tried_.emplace(&encoder, tryOut(encoder)).first->second;
+}
+
+// Where none works the moment may have been to blame: the next recording tries again.
+void Encoders::forgetFailures() {
+  const std::lock_guard lock(mutex_);
+  std::erase_if(tried_, [](const auto& each) { return !each.second; });
 }
 
 bool Encoders::tryOut(const Encoder& encoder) const {

@@ -64,6 +64,11 @@ public:
 
   HostTime hostTime() const override { return hostTimeNow(); }
 
+  std::vector<MediaEncoder> encoders(const std::string& codec) override {
+    initialize();
+    return encoders_->list(codec);
+  }
+
 private:
   static void initialize() {
     static std::once_flag once;

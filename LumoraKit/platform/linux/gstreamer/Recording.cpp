@@ -204,7 +204,7 @@ LMRErrorRef Recording::chooseEncoders() {
   for (Track& track : tracks_) {
     const MediaType type = track.plan.connection->mediaType();
     const std::string codec = codecOf(type, track.plan.options);
-    track.encoder = track.ended ? nullptr : encoders_->find(type, codec);
+    track.encoder = track.ended ? nullptr : encoders_->find(type, codec, track.plan.options.encoder);
     if (!track.ended && !track.encoder) {
       return captureError(CaptureErrorCode::EncoderMissing, format("No encoder for %@ works here", {codec}));
     }
