@@ -26,7 +26,7 @@ login_packages=(dbus gnome-keyring avahi-daemon iproute2 krb5-kdc krb5-admin-ser
 
 demo_packages=("${headless_packages[@]}" gstreamer1.0-tools ffmpeg)
 test_packages=("${headless_packages[@]}" "${login_packages[@]}" gstreamer1.0-tools ffmpeg polkitd xdg-desktop-portal man-db mandoc zsh
-  at-spi2-core gir1.2-atspi-2.0 python3-gi x11-xserver-utils)
+  at-spi2-core gir1.2-atspi-2.0 python3-gi x11-xserver-utils xdotool)
 bench_packages=(libbenchmark-dev libxml2-dev libpipewire-0.3-dev gstreamer1.0-tools bsdextrautils dbus gnome-keyring xvfb jwm)
 # The pictures of the login panel and the recorder: an optimiser, the letters that they show, a desktop's own style, and a
 # desktop with light and dark colours that a script uses by keyboard and mouse.
