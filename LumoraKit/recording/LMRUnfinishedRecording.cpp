@@ -126,6 +126,7 @@ std::vector<LMRSubmission> LMRUnfinishedRecording::submissions() const {
     }
     if (movie->isPlayable() && !source.submissionUUID.empty()) {
       LMRSubmission& submission = submissions.emplace_back();
+      submission.name = source.name;
       submission.file = source.file;
       submission.submissionUUID = source.submissionUUID;
       submission.userMetadata = note_.userMetadata;

@@ -58,8 +58,8 @@ public:
   /// command.
   /// \return null on success; else the server's error, or the journal's
   LMRErrorRef prepareSubmissionWithSession(const std::shared_ptr<LMRSession>& session);
-  /// What there is to submit: one entry a playable movie whose submission UUID is known, with the note's metadata, the
-  /// moments of begin and end, and the duration.
+  /// What there is to submit: one entry a playable movie whose submission UUID is known, with the source's name, the
+  /// note's metadata, the moments of begin and end, and the duration.
   std::vector<LMRSubmission> submissions() const;
   /// Adds them to the queue, those aside that it has already, and closes the note. The files of remote sources are the
   /// server's; unusable movies stay where they are. Null on success; after an error, also when there is nothing to

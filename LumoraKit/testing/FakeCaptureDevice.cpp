@@ -11,6 +11,16 @@ bool FakeCaptureDevice::hasMediaType(MediaType type) const {
   return std::find(types_.begin(), types_.end(), type) != types_.end();
 }
 
+std::string FakeCaptureDevice::localizedDisplayName() const {
+  const std::lock_guard lock(mutex_);
+  return name_.empty() ? uniqueID_ : name_;
+}
+
+void FakeCaptureDevice::setLocalizedDisplayName(std::string name) {
+  const std::lock_guard lock(mutex_);
+  name_ = std::move(name);
+}
+
 LMRErrorRef FakeCaptureDevice::open() {
   const std::lock_guard lock(mutex_);
   if (!openError_) {

@@ -16,11 +16,13 @@ public:
   FakeCaptureDevice(std::string uniqueID, std::vector<MediaType> types);
 
   std::string uniqueID() const override { return uniqueID_; }
-  /// The identifier.
-  std::string localizedDisplayName() const override { return uniqueID_; }
+  /// The identifier, unless it was given a name.
+  std::string localizedDisplayName() const override;
   bool hasMediaType(MediaType type) const override;
   LMRErrorRef open() override;
 
+  /// Gives it a name; that of another device may be the same.
+  void setLocalizedDisplayName(std::string name);
   /// The next opens fail with this error; null lets them succeed again.
   void failToOpen(LMRErrorRef error);
   /// Sessions refuse an input of this device with this error; null lets them take it again.
@@ -35,6 +37,7 @@ private:
   const std::string uniqueID_;
   const std::vector<MediaType> types_;
   mutable std::mutex mutex_;
+  std::string name_;
   LMRErrorRef openError_;
   LMRErrorRef addError_;
   int openCount_ = 0;

@@ -4,6 +4,7 @@
 namespace {
 
 constexpr std::string_view identifierKey = "identifier";
+constexpr std::string_view nameKey = "name";
 constexpr std::string_view fileKey = "file";
 constexpr std::string_view submissionUUIDKey = "submission_uuid";
 constexpr std::string_view userMetadataKey = "user_metadata";
@@ -34,6 +35,9 @@ lumora::Dictionary LMRSubmission::dictionaryRepresentation() const {
                                 {std::string(userNameKey), userName},
                                 {std::string(heldKey), state == State::Held},
                                 {std::string(attemptsKey), attempts}};
+  if (!name.empty()) {
+    dictionary.set(nameKey, name);
+  }
   if (lastError) {
     dictionary.set(lastErrorKey, *lastError);
   }
@@ -57,6 +61,7 @@ std::optional<LMRSubmission> LMRSubmission::submissionWithDictionary(const lumor
   if (!isComplete) {
     return std::nullopt;
   }
+  submission.name = dictionary.string(nameKey).value_or("");
   submission.file = file;
   submission.state = isHeld ? State::Held : State::Waiting;
   submission.lastError = dictionary.string(lastErrorKey);

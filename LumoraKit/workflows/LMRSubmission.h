@@ -23,6 +23,10 @@ struct LUMORA_EXPORT LMRSubmission {
   /// Given by the queue: a UUID.
   std::string identifier;
 
+  /// For a list of the application's, beside the title: which part of an episode it is, a camera's name for instance.
+  /// Kept, and not sent.
+  std::string name;
+
   // What is submitted.
 
   /// Absolute.

@@ -19,6 +19,9 @@ LMRErrorRef Recovery::note(const Take& take, const Episode& episode) {
   }
   auto note = LMRRecordingNote::noteWithRecorder(take.recorder());
   note.userMetadata = episode.userMetadata();
+  for (LMRNotedSource& source : note.sources) {
+    source.name = source.isLocal() ? take.nameOf(source.file) : source.name;
+  }
   LMRErrorRef error = journal_->open(note);
   if (!error) {
     note_ = std::move(note);

@@ -1,6 +1,9 @@
 #include "recorder/model/Take.h"
 
+#include "recorder/model/Texts.h"
+
 #include <algorithm>
+#include <string>
 #include <utility>
 
 namespace recorder {
@@ -156,6 +159,7 @@ std::vector<LMRSubmission> Take::submissions(const Episode& episode) const {
     }
     LMRSubmission submission;
     submission.file = *local->outputFileURL();
+    submission.name = nameOf(submission.file);
     submission.submissionUUID = *local->submissionUUID();
     submission.userMetadata = episode.userMetadata();
     submission.recordingMetadata = {
@@ -168,6 +172,19 @@ std::vector<LMRSubmission> Take::submissions(const Episode& episode) const {
     all.push_back(std::move(submission));
   }
   return all;
+}
+
+std::string Take::nameOf(const std::filesystem::path& file) const {
+  const auto nameAt = [this](std::size_t place) { return sources_[place]->plan().source.name; };
+  for (std::size_t i = 0; i < sources_.size() && sources_.size() > 1; ++i) {
+    const auto local = std::dynamic_pointer_cast<LMRLocalVideoRecorder>(recorders_[i]);
+    if (local && local->outputFileURL() == file) {
+      const auto namesakes = std::ranges::count(
+          sources_, nameAt(i), [](const std::shared_ptr<Source>& each) { return each->plan().source.name; });
+      return namesakes > 1 ? filled("Source %1", {std::to_string(i + 1)}) : nameAt(i);
+    }
+  }
+  return {};
 }
 
 std::vector<std::string> Take::files() const {

@@ -4,6 +4,7 @@
 
 #include <LumoraKit/LumoraKit.h>
 
+#include <filesystem>
 #include <memory>
 #include <set>
 #include <string>
@@ -76,6 +77,8 @@ public:
 
   /// What is to be submitted when it has stopped: each file of this machine.
   std::vector<LMRSubmission> submissions(const Episode& episode) const;
+  /// What tells the file of a source from the others of the same episode; empty when it has one source only.
+  std::string nameOf(const std::filesystem::path& file) const;
   /// The files that a stop without a server left.
   std::vector<std::string> files() const;
 

@@ -72,7 +72,7 @@ inline constexpr std::array textTable{
     TextEntry{"%1 s", "%1 Sek.", "%1 s", "%1 s", "%1秒"},
 
     // The episode.
-    TextEntry{"&Workflow", "Arbeits&ablauf", "&Flux de travail", "&Flujo de trabajo", "ワークフロー(&W)"},
+    TextEntry{"&Workflow", "Arbeitsab&lauf", "&Flux de travail", "&Flujo de trabajo", "ワークフロー(&W)"},
     TextEntry{"&Title", "&Titel", "&Titre", "&Título", "タイトル(&T)"},
     TextEntry{"&Description", "&Beschreibung", "&Description", "&Descripción", "説明(&D)"},
     TextEntry{"Recording of %1", "Aufnahme vom %1", "Enregistrement du %1", "Grabación del %1", "%1 の収録"},
@@ -93,6 +93,8 @@ inline constexpr std::array textTable{
               "Hier erscheinen Aufnahmen auf ihrem Weg zum Server.",
               "Les enregistrements en route vers le serveur apparaissent ici.",
               "Aquí aparecen las grabaciones en camino al servidor.", "サーバへ送信中の収録がここに表示されます。"},
+    // An episode's title and which part of it.
+    TextEntry{"%1 – %2", "%1 – %2", "%1 – %2", "%1 – %2", "%1（%2）"},
     TextEntry{"Is being submitted…", "Wird übermittelt …", "Envoi en cours…", "Se está enviando…", "送信しています…"},
     TextEntry{"Not submitted: %1", "Nicht übermittelt: %1", "Non envoyé : %1", "No enviado: %1", "未送信: %1"},
     TextEntry{"Will be tried again: %1", "Wird erneut versucht: %1", "Sera réessayé : %1", "Se reintentará: %1",
@@ -159,7 +161,7 @@ inline constexpr std::array textTable{
     TextEntry{"&Application", "&Anwendung", "&Application", "&Aplicación", "アプリケーション(&A)"},
     TextEntry{"&Log In…", "An&melden …", "Se &connecter…", "&Iniciar sesión…", "ログイン(&L)…"},
     TextEntry{"&Settings…", "&Einstellungen …", "&Réglages…", "A&justes…", "設定(&S)…"},
-    TextEntry{"&Quit", "Be&enden", "&Quitter", "&Salir", "終了(&Q)"},
+    TextEntry{"&Quit", "&Beenden", "&Quitter", "&Salir", "終了(&Q)"},
     TextEntry{"&Recording", "A&ufnahme", "&Enregistrement", "&Grabación", "収録(&R)"},
     TextEntry{"&Record", "&Aufnehmen", "&Enregistrer", "&Grabar", "収録(&R)"},
     TextEntry{"&Pause or Resume", "A&nhalten oder fortsetzen", "&Suspendre ou reprendre", "&Pausar o reanudar",

@@ -13,8 +13,12 @@
 namespace recorder {
 namespace {
 
+// The parts of an episode have the same title.
 QString titleOf(const LMRSubmission& submission) {
-  return QString::fromStdString(submission.userMetadata.string(LMREpisodeUserMetadataTitleKey).value_or(""));
+  const auto title =
+      QString::fromStdString(submission.userMetadata.string(LMREpisodeUserMetadataTitleKey).value_or(""));
+  const auto name = QString::fromStdString(submission.name);
+  return name.isEmpty() ? title : words("%1 – %2").arg(title, name);
 }
 
 QString reasonOf(const LMRSubmission& submission) {

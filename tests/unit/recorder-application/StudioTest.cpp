@@ -24,6 +24,7 @@ using ::testing::HasSubstr;
 using ::testing::IsEmpty;
 using ::testing::Not;
 using ::testing::SizeIs;
+using ::testing::UnorderedElementsAre;
 
 constexpr lumora::HostTime second = 1'000'000'000;
 
@@ -77,12 +78,10 @@ protected:
     queues_->runAll();
   }
   TakeState state() const { return studio_->take()->state(); }
-  std::vector<std::string> submittedUUIDs() const {
+  std::vector<std::string> submittedNames() const {
     std::vector<std::string> all;
-    for (const auto& request : platform_.toolRunner->requests()) {
-      if (request.command() == "submit") {
-        all.push_back(request.value("submission_uuid").value_or(request.value("uuid").value_or("")));
-      }
+    for (const LMRSubmission& submission : studio_->submissions().submitted()) {
+      all.push_back(submission.name);
     }
     return all;
   }
@@ -139,7 +138,26 @@ TEST_F(StudioTest, recordsTwoSources) {
   record();
   studio_->take()->stop(studio_->episode());
   pass(0.1);
-  EXPECT_THAT(studio_->submissions().submitted(), SizeIs(2));
+  EXPECT_THAT(submittedNames(), UnorderedElementsAre("camera", "Screen"));
+}
+
+TEST_F(StudioTest, numbersTheSources_whoseNamesAreTheSame) {
+  platform_.toolRunner->reply(
+      "listworkflows", ToolReply::success({{"workflows", lumora::Array{description("two", {{"Video"}, {"Video"}})}}}));
+  platform_.mediaCapture->addDevice("camera 2", {MediaType::Video})->setLocalizedDisplayName("camera");
+  begin("two");
+  record();
+  studio_->take()->stop(studio_->episode());
+  pass(0.1);
+  EXPECT_THAT(submittedNames(), UnorderedElementsAre("Source 1", "Source 2"));
+}
+
+TEST_F(StudioTest, givesNoNameToTheOnlySource) {
+  begin();
+  record();
+  studio_->take()->stop(studio_->episode());
+  pass(0.1);
+  EXPECT_THAT(submittedNames(), ElementsAre(""));
 }
 
 TEST_F(StudioTest, recordsAMicrophone) {

@@ -6,6 +6,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <cctype>
 #include <set>
 #include <string>
 
@@ -25,6 +26,13 @@ std::multiset<std::string> marksOf(std::string_view text) {
   return marks;
 }
 
+// The letter that leads to it, whichever case; also one of two bytes.
+std::string keyOf(std::string_view text) {
+  const std::string_view letter = text.substr(text.find('&') + 1);
+  const auto first = static_cast<unsigned char>(letter.front());
+  return first < 0x80 ? std::string(1, static_cast<char>(std::toupper(first))) : std::string(letter.substr(0, 2));
+}
+
 TEST(Texts, areThereInAllLanguages_withTheSamePlaces) {
   for (const TextEntry& entry : textTable) {
     for (const std::string_view each : {entry.german, entry.french, entry.spanish, entry.japanese}) {
@@ -38,6 +46,28 @@ TEST(Texts, standOnceInTheTable) {
   std::set<std::string_view> all;
   for (const TextEntry& entry : textTable) {
     EXPECT_TRUE(all.insert(entry.english).second) << entry.english;
+  }
+}
+
+// What is seen together.
+TEST(Texts, leadToOneThingEach_byTheirKeys) {
+  const std::set<std::string_view> window{"&Application", "&Recording",   "&Workflow",
+                                          "&Title",       "&Description", "Su&bmissions"};
+  const std::set<std::string_view> applicationMenu{"&Log In…", "&Settings…", "&Quit"};
+  const std::set<std::string_view> recordingMenu{"&Record", "&Pause or Resume", "&Stop and Submit", "&Discard…"};
+  const std::set<std::string_view> settings{
+      "&Folder for recordings:", "&Quality:", "&Encoder:", "&Camera:", "&Microphone:"};
+  for (const auto& group : {window, applicationMenu, recordingMenu, settings}) {
+    for (const auto language :
+         {&TextEntry::english, &TextEntry::german, &TextEntry::french, &TextEntry::spanish, &TextEntry::japanese}) {
+      std::set<std::string> keys;
+      for (const TextEntry& entry : textTable) {
+        if (group.contains(entry.english)) {
+          EXPECT_TRUE(keys.insert(keyOf(entry.*language)).second) << entry.*language;
+        }
+      }
+      EXPECT_EQ(keys.size(), group.size());
+    }
   }
 }
 

@@ -328,6 +328,15 @@ INSTANTIATE_TEST_SUITE_P(Each, SubmissionEntry,
                          testing::Values("identifier", "file", "submission_uuid", "user_metadata", "recording_metadata",
                                          "delete_after_submission", "server", "port", "user", "held", "attempts"));
 
+TEST(SubmissionEntryText, keepsItsName_andNeedsNone) {
+  LMRSubmission submission;
+  submission.file = "/movies/A.mov";
+  submission.name = "Screen";
+  EXPECT_EQ(LMRSubmission::submissionWithDictionary(submission.dictionaryRepresentation())->name, "Screen");
+  submission.name.clear();
+  EXPECT_EQ(LMRSubmission::submissionWithDictionary(submission.dictionaryRepresentation())->name, "");
+}
+
 TEST(SubmissionEntryText, isRefused_whenANumberIsTooLarge) {
   auto dictionary = LMRSubmission().dictionaryRepresentation();
   dictionary.set("port", 65'536U);

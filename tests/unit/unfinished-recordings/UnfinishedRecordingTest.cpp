@@ -109,6 +109,8 @@ TEST_F(UnfinishedRecording, tellsTheServerWhenItBeganAndHowLongItIs) {
   recording.prepareSubmissionWithSession(session_);
   const auto submissions = recording.submissions();
   ASSERT_THAT(submissions, SizeIs(2));
+  EXPECT_EQ(submissions[0].name, "Camera");
+  EXPECT_EQ(submissions[1].name, "Screen");
   EXPECT_EQ(submissions[0].userMetadata.string("Title"), "Lecture");
   const auto& metadata = submissions[0].recordingMetadata;
   EXPECT_EQ(*metadata.find(LMREpisodeRecordingMetadataStartDateKey), lumora::Value(note_.began));
