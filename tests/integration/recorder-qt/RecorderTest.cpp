@@ -1,16 +1,20 @@
 #include "RecorderRig.h"
+#include "support/Movie.h"
 
 #include <gmock/gmock.h>
 
 #include <QLabel>
 #include <QListWidget>
 #include <QPushButton>
+#include <algorithm>
 #include <filesystem>
 #include <string>
+#include <utility>
 
 namespace recorder {
 namespace {
 
+using lumora::testing::Movie;
 using ::testing::IsEmpty;
 using ::testing::SizeIs;
 
@@ -35,8 +39,38 @@ protected:
     ASSERT_TRUE(waitFor([&] { return studio().take()->elapsedTime() > 1; }));
   }
   static std::string contentOf(const lumora::Dictionary& episode) {
-    const auto& file = *episode.array("files")->at(0).dictionary();
-    return lumora::tests::contentOf(file.string("path").value());
+    return lumora::tests::contentOf(episode.array("files")->at(0).dictionary()->string("path").value());
+  }
+  static Movie movieOf(const lumora::Dictionary& episode) {
+    return Movie(episode.array("files")->at(0).dictionary()->string("path").value());
+  }
+  /// The first camera, as the server's administrator sees it: its name and its state.
+  std::string cameraOfServer() const {
+    const std::string line = server_->administrate({"camera", "list"}).standardOutput;
+    return line.substr(0, line.find('\t', line.find('\t') + 1));
+  }
+  void expectTwoPartsOfOneRecording(const std::string& title) {
+    auto episodes = server_->episodes();
+    ASSERT_THAT(episodes, SizeIs(2));
+    const auto place = [](const lumora::Dictionary& each) { return each.find("source_index")->integer().value(); };
+    std::ranges::sort(episodes, {}, place);
+    EXPECT_EQ(place(episodes[0]) + 1, place(episodes[1]));
+    EXPECT_EQ(episodes[0].string("recording_uuid"), episodes[1].string("recording_uuid"));
+    for (const auto& [episode, codec] : {std::pair(episodes[0], "h264"), std::pair(episodes[1], "png")}) {
+      EXPECT_EQ(episode.string("title"), title);
+      EXPECT_EQ(movieOf(episode).stream("v", "codec_name"), codec);
+      EXPECT_TRUE(movieOf(episode).decodes());
+      EXPECT_GT(movieOf(episode).duration(), 1);
+    }
+  }
+  bool listSays(const QString& beginning) const {
+    const auto* const list = find<QListWidget>("submissions");
+    for (int i = 0; i < list->count(); ++i) {
+      if (list->item(i)->text().startsWith(beginning)) {
+        return true;
+      }
+    }
+    return false;
   }
   bool hasSubmitted(std::size_t episodes) {
     return waitFor([&] { return !studio().isUnderWay() && server_->episodes().size() == episodes; });
@@ -63,6 +97,52 @@ TEST_F(RecorderWindowTest, recordsCameraAndScreen_andSubmitsThem) {
   EXPECT_EQ(studio().notice(), "");
   EXPECT_TRUE(waitFor([&] { return studio().submissions().waiting().empty(); }));
   EXPECT_TRUE(waitFor([&] { return studio().canRecord(); }));
+  EXPECT_TRUE(waitFor([&] { return listSays("Waves – Headless camera\nArrived"); }));
+  EXPECT_TRUE(waitFor([&] { return listSays("Waves – Screen\nArrived"); }));
+}
+
+TEST_F(RecorderWindowTest, recordsACameraOfTheServer_besideOneOfItsOwn) {
+  server_->administrate({"camera", "add"}, {"Studio A"});
+  server_->administrate({"workflow", "add"},
+                        {"two-cameras", "--title", "Two Cameras", "--source", "Video", "--source", "Video"});
+  open();
+  logIn();
+  ASSERT_TRUE(selectWorkflow("Two Cameras"));
+  ASSERT_THAT(studio().sources(), SizeIs(2));
+  ASSERT_EQ(studio().sources()[1]->plan().source.kind, SourceKind::RemoteCamera);
+  EXPECT_TRUE(waitFor([&] { return !studio().sources()[1]->pictureFile().empty(); }));
+  type("title", "Two views");
+  recordForAWhile();
+  EXPECT_EQ(cameraOfServer(), "Studio A\trecording");
+  press("pause");
+  ASSERT_TRUE(isIn(TakeState::Paused));
+  EXPECT_EQ(studio().sources()[1]->state(), SourceState::Paused);
+  EXPECT_EQ(cameraOfServer(), "Studio A\tpaused");
+  press("pause");
+  ASSERT_TRUE(isIn(TakeState::Recording));
+  press("stop");
+  ASSERT_TRUE(hasSubmitted(2)) << studio().notice();
+  EXPECT_EQ(cameraOfServer(), "Studio A\tidle");
+  expectTwoPartsOfOneRecording("Two views");
+  EXPECT_TRUE(waitFor([&] { return studio().canRecord(); }));
+}
+
+// Somebody else records with it.
+TEST_F(RecorderWindowTest, tellsThatACameraOfTheServerDoesNotStart_andRecordsLater) {
+  server_->administrate({"camera", "add"}, {"Studio A"});
+  open();
+  logIn();
+  ASSERT_TRUE(selectWorkflow("Single Video"));
+  studio().chooseSource(0, {SourceKind::RemoteCamera, "Studio A", "Studio A"});
+  ASSERT_TRUE(waitFor([&] { return studio().canRecord(); }));
+  server_->administrate({"inject", "failure"}, {"--command", "start", "--status", "36", "--times", "1"});
+  press("record");
+  ASSERT_TRUE(waitFor([&] { return studio().notice().find("did not start") != std::string::npos; }));
+  ASSERT_TRUE(waitFor([&] { return studio().canRecord(); }));
+  recordForAWhile();
+  press("stop");
+  ASSERT_TRUE(hasSubmitted(1)) << studio().notice();
+  EXPECT_EQ(cameraOfServer(), "Studio A\tidle");
 }
 
 TEST_F(RecorderWindowTest, showsALostCamera_andSubmitsWhatThereIs) {
