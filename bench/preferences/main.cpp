@@ -1,4 +1,5 @@
 #include "support/Figures.h"
+#include "support/TemporaryFolder.h"
 
 #include <LumoraKit/platform/linux/FilePreferences.h>
 
@@ -18,23 +19,6 @@ constexpr int processes = 8;
 constexpr int updates = 200;
 constexpr const char* domain = "org.vantor.lumora.bench";
 
-class Folder {
-public:
-  Folder() : path_((std::filesystem::temp_directory_path() / "lumora-bench-XXXXXX").string()) {
-    if (!mkdtemp(path_.data())) {
-      std::abort();
-    }
-  }
-  Folder(const Folder&) = delete;
-  Folder& operator=(const Folder&) = delete;
-  ~Folder() { std::filesystem::remove_all(path_); }
-
-  const std::string& path() const { return path_; }
-
-private:
-  std::string path_;
-};
-
 // Each update is a key of its own: one that is lost is missing at the end.
 std::string key(int process, int update) {
   std::string key = std::to_string(process);
@@ -43,7 +27,7 @@ std::string key(int process, int update) {
   return key;
 }
 
-void updateInChild(const std::string& folder, int process) {
+void updateInChild(const std::filesystem::path& folder, int process) {
   if (fork() == 0) {
     backend::FilePreferences preferences(folder);
     for (int update = 0; update < updates; ++update) {
@@ -53,7 +37,7 @@ void updateInChild(const std::string& folder, int process) {
   }
 }
 
-int keptUpdates(const std::string& folder) {
+int keptUpdates(const std::filesystem::path& folder) {
   backend::FilePreferences preferences(folder);
   int kept = 0;
   for (int process = 0; process < processes; ++process) {
@@ -66,7 +50,7 @@ int keptUpdates(const std::string& folder) {
 
 void contendedUpdates(benchmark::State& state) {
   for ([[maybe_unused]] auto iteration : state) {
-    const Folder folder;
+    const tests::TemporaryFolder folder;
     for (int process = 0; process < processes; ++process) {
       updateInChild(folder.path(), process);
     }

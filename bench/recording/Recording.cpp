@@ -2,6 +2,7 @@
 // encoders in bare pipelines. Both sides take turns on the same headless devices, each in a process of its own, and the
 // medians are compared.
 #include "support/Figures.h"
+#include "support/TemporaryFolder.h"
 
 #include <LumoraKit/platform/MediaCapture.h>
 #include <LumoraKit/platform/Platform.h>
@@ -238,14 +239,10 @@ Comparison compare(const std::string& self, const Paths& files) {
 }
 
 int compare(const std::string& self) {
-  std::string folder = std::filesystem::temp_directory_path() / "lumora-bench-XXXXXX";
-  if (!::mkdtemp(folder.data())) {
-    fail("mkdtemp");
-  }
-  const std::filesystem::path first = std::filesystem::path(folder) / "first.mov";
+  const tests::TemporaryFolder folder;
+  const std::filesystem::path first = folder / "first.mov";
   const Comparison one = compare(self, {first});
-  const Comparison two = compare(self, {first, std::filesystem::path(folder) / "second.mov"});
-  std::filesystem::remove_all(folder);
+  const Comparison two = compare(self, {first, folder / "second.mov"});
   using bench::Bar;
   bool good = bench::report("CPU of a 720p30 recording with sound against the same encoders in gst-launch", one.ratio,
                             Bar::AtMost, 1.10);

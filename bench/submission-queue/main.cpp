@@ -2,6 +2,7 @@
 // keep nothing. The server is a fake that answers at once, the disk is real.
 
 #include "support/Figures.h"
+#include "support/TemporaryFolder.h"
 
 #include <LumoraKit/actions/LMRActionFactory.h>
 #include <LumoraKit/platform/MainThread.h>
@@ -17,8 +18,6 @@
 #include <iostream>
 #include <string>
 
-#include <unistd.h>
-
 namespace lumora::bench {
 namespace {
 
@@ -27,11 +26,6 @@ constexpr int submissions = 200;
 class Bench {
 public:
   Bench() {
-    std::string name = (std::filesystem::temp_directory_path() / "lumora-bench-XXXXXX").string();
-    if (mkdtemp(name.data()) == nullptr) {
-      std::abort();
-    }
-    folder_ = name;
     std::ofstream(file()) << "movie";
     auto platform = Platform::current();
     platform.toolRunner = std::make_shared<fakes::FakeToolRunner>();
@@ -41,16 +35,12 @@ public:
     session_->setPassword("apple");
     session_->setAuthenticationType(LMRAuthenticationTypePassword);
   }
-  Bench(const Bench&) = delete;
-  Bench& operator=(const Bench&) = delete;
-  ~Bench() { std::filesystem::remove_all(folder_); }
-
   std::filesystem::path file() const { return folder_ / "lecture.mov"; }
   std::filesystem::path queueFolder() const { return folder_ / "queue"; }
   const std::shared_ptr<LMRSession>& session() const { return session_; }
 
 private:
-  std::filesystem::path folder_;
+  tests::TemporaryFolder folder_;
   std::shared_ptr<LMRSession> session_ = LMRSession::session();
 };
 

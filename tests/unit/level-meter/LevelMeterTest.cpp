@@ -1,8 +1,6 @@
 #include "support/CameraAndMicrophone.h"
 
 #include <LumoraKit/recording/LMRLevelMeter.h>
-#include <LumoraKit/testing/FakeCaptureDevice.h>
-#include <LumoraKit/testing/FakeCaptureSession.h>
 #include <LumoraKit/testing/FakeMovieFileOutput.h>
 #include <LumoraKit/testing/FakePlatform.h>
 
