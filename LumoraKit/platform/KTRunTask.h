@@ -16,8 +16,8 @@ public:
   /// \param executable absolute path
   /// \param arguments without the program's name
   /// \param standardOutput,standardError receive everything the tool wrote, byte for byte
-  /// \return the exit status; 128+n for a tool that died of signal n; 127, with the reason as standard error, for one
-  ///   that could not be started
+  /// \return the exit status; 128+n for a tool that died of signal n; 127, with the reason at the end of the standard
+  ///   error, for one that could not be started, or whose input or outputs the system has lost
   virtual int run(const std::string& executable, const std::vector<std::string>& arguments,
                   const std::string& standardInput, std::string& standardOutput, std::string& standardError) = 0;
 };

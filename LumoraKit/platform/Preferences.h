@@ -9,7 +9,8 @@
 namespace lumora {
 
 /// Per-user preferences, one store a domain (an application's or a library's identifier). Any thread and any number
-/// of processes. What cannot be read counts as absent; what cannot be written is logged and otherwise lost.
+/// of processes. What cannot be read is logged and counts as absent; what cannot be written is logged and otherwise
+/// lost.
 class LUMORA_EXPORT Preferences {
 public:
   virtual ~Preferences();

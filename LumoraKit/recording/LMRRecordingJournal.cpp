@@ -6,6 +6,7 @@
 #include <LumoraKit/recording/LMRRecordingJournal.h>
 
 #include <algorithm>
+#include <cerrno>
 #include <tuple>
 #include <utility>
 
@@ -62,10 +63,7 @@ LMRErrorRef LMRRecordingJournal::open(LMRRecordingNote& note) {
   const auto& files = Platform::current().files;
   LMRErrorRef error;
   auto lock = files->lockFile(lockFile(opened.identifier), &error);
-  if (!lock) {
-    return error;
-  }
-  error = write(opened);
+  error = lock ? write(opened) : error;
   if (error) {
     files->removeFile(lockFile(opened.identifier));
     return error;
@@ -88,7 +86,9 @@ LMRErrorRef LMRRecordingJournal::close(const std::string& identifier) {
   const auto& files = Platform::current().files;
   LMRErrorRef error = files->removeFile(noteFile(identifier));
   if (!error) {
-    files->removeFile(lockFile(identifier));
+    if (const LMRErrorRef left = files->removeFile(lockFile(identifier))) {
+      lumora::log("%@ cannot be removed: %@", {lockFile(identifier).string(), left->localizedDescription()});
+    }
     open_.erase(identifier);
   }
   return error;
@@ -125,38 +125,42 @@ LMRErrorRef LMRRecordingJournal::write(const LMRRecordingNote& note) const {
   return text ? Platform::current().files->writeAtomically(noteFile(note.identifier), *text) : error;
 }
 
-std::optional<LMRRecordingNote> LMRRecordingJournal::read(const fs::path& file) const {
+// One that has just been closed needs no word.
+std::optional<LMRRecordingNote> LMRRecordingJournal::read(const fs::path& file, bool& isGone) const {
   LMRErrorRef error;
   const auto text = Platform::current().files->contentOfFile(file, &error);
   const auto dictionary = text ? lumora::dictionaryWithXMLDescription_error(*text, &error) : std::nullopt;
   auto note = dictionary ? LMRRecordingNote::noteWithDictionary(*dictionary) : std::nullopt;
+  isGone = !text && error->code() == ENOENT;
   if (note && noteFile(note->identifier) == file) {
     return note;
   }
-  // One that has just been closed needs no word.
-  if (!Platform::current().files->isFile(file)) {
-    return std::nullopt;
+  if (!isGone) {
+    lumora::log("The note of a recording in %@ cannot be read: %@",
+                {file.string(), error ? error->localizedDescription() : "it is not complete"});
   }
-  lumora::log("The note of a recording in %@ cannot be read: %@",
-              {file.string(), error ? error->localizedDescription() : "it is not complete"});
   return std::nullopt;
 }
 
 // It is read again under the lock: whoever had it may have changed or closed it meanwhile.
 std::optional<LMRRecordingNote> LMRRecordingJournal::take(const fs::path& file) {
-  auto note = read(file);
+  bool isGone = false;
+  auto note = read(file, isGone);
   const auto& files = Platform::current().files;
-  auto lock = note ? files->lockFile(lockFile(note->identifier), nullptr) : nullptr;
+  LMRErrorRef error;
+  auto lock = note ? files->lockFile(lockFile(note->identifier), &error) : nullptr;
   if (!lock) {
+    if (error && error->code() != EWOULDBLOCK) {
+      lumora::log("The note of a recording in %@ cannot be taken: %@", {file.string(), error->localizedDescription()});
+    }
     return std::nullopt;
   }
-  if (!files->isFile(file)) {
-    files->removeFile(lockFile(note->identifier));
-    return std::nullopt;
-  }
-  note = read(file);
+  const std::string identifier = note->identifier;
+  note = read(file, isGone);
   if (note) {
-    open_[note->identifier] = std::move(lock);
+    open_[identifier] = std::move(lock);
+  } else if (isGone) {
+    files->removeFile(lockFile(identifier));
   }
   return note;
 }

@@ -72,7 +72,7 @@ private:
   std::filesystem::path noteFile(const std::string& identifier) const;
   std::filesystem::path lockFile(const std::string& identifier) const;
   LMRErrorRef write(const LMRRecordingNote& note) const;
-  std::optional<LMRRecordingNote> read(const std::filesystem::path& file) const;
+  std::optional<LMRRecordingNote> read(const std::filesystem::path& file, bool& isGone) const;
   std::optional<LMRRecordingNote> take(const std::filesystem::path& file);
   bool isOpen(const std::string& identifier) const;
 

@@ -11,7 +11,9 @@
 #include <LumoraKit/workflows/LMRSubmissionQueue.h>
 
 #include <algorithm>
+#include <cerrno>
 #include <chrono>
+#include <iterator>
 #include <utility>
 
 // One property list an entry, "<identifier>.plist". An entry is written before it counts and removed after the server
@@ -46,11 +48,17 @@ LMRErrorRef refusal(const std::string& why) {
 
 std::chrono::seconds pauseAfter(std::uint32_t attempts) {
   constexpr std::uint32_t doublings = 6;
-  return std::min(firstPause * (1U << std::min(attempts - 1, doublings)), longestPause);
+  const std::uint32_t before = std::max(attempts, 1U) - 1;
+  return std::min(firstPause * (1U << std::min(before, doublings)), longestPause);
+}
+
+bool isGone(const LMRErrorRef& error) {
+  return error->code() == ENOENT || error->code() == ENOTDIR;
 }
 
 // What the action was given on disk; nobody else removes it.
-void removeMetadataFiles(const LMRAction& action) {
+std::vector<fs::path> metadataFiles(const LMRAction& action) {
+  std::vector<fs::path> files;
   const auto arguments = action.arguments().value_or(lumora::Array());
   for (const auto& argument : arguments) {
     const lumora::Array* const pair = argument.array();
@@ -59,9 +67,19 @@ void removeMetadataFiles(const LMRAction& action) {
         (pair->front() == lumora::Value("metadata") || pair->front() == lumora::Value("recording_metadata"));
     const std::string* const path = isMetadata ? pair->back().string() : nullptr;
     if (path) {
-      Platform::current().files->removeFile(*path);
+      files.emplace_back(*path);
     }
   }
+  return files;
+}
+
+// False when it is still there.
+bool isRemoved(const fs::path& file) {
+  const LMRErrorRef error = Platform::current().files->removeFile(file);
+  if (error && !isGone(error)) {
+    lumora::log("The metadata file %@ cannot be removed: %@", {file.string(), error->localizedDescription()});
+  }
+  return !error || isGone(error);
 }
 
 } // namespace
@@ -93,7 +111,9 @@ std::shared_ptr<LMRSubmissionQueue> LMRSubmissionQueue::queueWithFolder_error(co
 LMRSubmissionQueue::LMRSubmissionQueue(MadeByFactory, fs::path folder, std::shared_ptr<void> lock)
     : folder_(std::move(folder)), lock_(std::move(lock)) {}
 
-LMRSubmissionQueue::~LMRSubmissionQueue() = default;
+LMRSubmissionQueue::~LMRSubmissionQueue() {
+  std::erase_if(metadataFiles_, isRemoved);
+}
 
 // What is kept on disk.
 
@@ -241,16 +261,20 @@ void LMRSubmissionQueue::proceed() {
   }
 }
 
-// The tool removes a file that is to be deleted only when the server has it.
+// The tool removes a file that is to be deleted only when the server has it. One that only cannot be looked at is not
+// removed.
 void LMRSubmissionQueue::begin(Entry& entry) {
   LMRSubmission& submission = entry.submission;
-  if (Platform::current().files->isFile(submission.file)) {
+  LMRErrorRef error;
+  if (Platform::current().files->sizeOfFile(submission.file, &error)) {
     ++submission.attempts;
     submission.state = LMRSubmission::State::Submitting;
     current_ = submission.identifier;
     save(entry);
     startAction(submission);
     postChange();
+  } else if (!isGone(error)) {
+    fail(entry, error->localizedDescription(), false);
   } else if (submission.deleteAfterSubmission && submission.attempts > 0) {
     complete(LMRSubmission(submission));
   } else {
@@ -271,7 +295,8 @@ void LMRSubmissionQueue::startAction(const LMRSubmission& submission) {
 }
 
 LMRSubmissionQueue::Entry* LMRSubmissionQueue::endOfAction(const std::shared_ptr<LMRAction>& action) {
-  removeMetadataFiles(*action);
+  std::ranges::move(metadataFiles(*action), std::back_inserter(metadataFiles_));
+  std::erase_if(metadataFiles_, isRemoved);
   return find(std::exchange(current_, {}));
 }
 

@@ -113,4 +113,6 @@ private:
   std::shared_ptr<LMRSession> session_;
   // What is being submitted; empty when nothing is.
   std::string current_;
+  // Of actions that have ended; one that cannot be removed is tried again after the next action.
+  std::vector<std::filesystem::path> metadataFiles_;
 };

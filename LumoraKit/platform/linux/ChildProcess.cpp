@@ -18,20 +18,25 @@ class FileActions {
 public:
   explicit FileActions(const ChildDescriptors& descriptors) {
     posix_spawn_file_actions_init(&actions_);
-    posix_spawn_file_actions_adddup2(&actions_, descriptors.standardInput, STDIN_FILENO);
-    posix_spawn_file_actions_adddup2(&actions_, descriptors.standardOutput, STDOUT_FILENO);
-    posix_spawn_file_actions_adddup2(&actions_, descriptors.standardError, STDERR_FILENO);
+    note(posix_spawn_file_actions_adddup2(&actions_, descriptors.standardInput, STDIN_FILENO));
+    note(posix_spawn_file_actions_adddup2(&actions_, descriptors.standardOutput, STDOUT_FILENO));
+    note(posix_spawn_file_actions_adddup2(&actions_, descriptors.standardError, STDERR_FILENO));
     // Also what other code of this process opened without close-on-exec.
-    posix_spawn_file_actions_addclosefrom_np(&actions_, firstDescriptorToClose);
+    note(posix_spawn_file_actions_addclosefrom_np(&actions_, firstDescriptorToClose));
   }
   FileActions(const FileActions&) = delete;
   FileActions& operator=(const FileActions&) = delete;
   ~FileActions() { posix_spawn_file_actions_destroy(&actions_); }
 
   const posix_spawn_file_actions_t* get() const { return &actions_; }
+  // 0, or why they are not complete: a child must not be started with descriptors of this process.
+  int error() const { return error_; }
 
 private:
+  void note(int error) { error_ = error_ != 0 ? error_ : error; }
+
   posix_spawn_file_actions_t actions_{};
+  int error_ = 0;
 };
 
 class SpawnAttributes {
@@ -77,6 +82,9 @@ int decoded(int waitStatus) {
 int ChildProcess::start(const std::string& executable, const std::vector<std::string>& arguments,
                         const ChildDescriptors& descriptors) {
   const FileActions actions(descriptors);
+  if (actions.error() != 0) {
+    return actions.error();
+  }
   const SpawnAttributes attributes;
   const auto vector = argumentVector(executable, arguments);
   const int error = posix_spawn(&process_, executable.c_str(), actions.get(), attributes.get(), vector.data(), environ);

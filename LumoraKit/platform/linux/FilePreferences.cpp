@@ -71,8 +71,13 @@ bool change(Dictionary& stored, std::string_view key, const std::optional<Value>
   return true;
 }
 
+LMRErrorRef unseen() {
+  return LMRError::make(LMRPosixErrorDomain, EIO, "The present value could not be read before");
+}
+
+// isSeen: whether the caller knows what there is; otherwise only a new key is stored.
 LMRErrorRef update(const std::filesystem::path& folder, std::string_view domain, std::string_view key,
-                   const std::optional<Value>& value) {
+                   const std::optional<Value>& value, bool isSeen) {
   if (folder.empty()) {
     return LMRError::fromErrno(ENOENT, "home folder");
   }
@@ -88,6 +93,9 @@ LMRErrorRef update(const std::filesystem::path& folder, std::string_view domain,
   if (!error) {
     error = load(path, stored);
   }
+  if (!error && !isSeen && stored.find(key)) {
+    error = unseen();
+  }
   if (error || !change(stored, key, value)) {
     return error;
   }
@@ -99,16 +107,33 @@ LMRErrorRef update(const std::filesystem::path& folder, std::string_view domain,
 
 std::optional<Value> FilePreferences::value(std::string_view domain, std::string_view key) {
   // Without the lock: a file is only ever replaced as a whole.
-  const auto content = folder_.empty() ? std::nullopt : contentOfFile(folder_ / (fileName(domain) + ".plist"));
+  const auto path = folder_ / (fileName(domain) + ".plist");
+  const auto content = folder_.empty() ? std::nullopt : contentOfFile(path);
+  const bool isUnseen = !content && !folder_.empty() && errno != ENOENT;
+  if (isUnseen) {
+    const LMRErrorRef error = LMRError::fromErrno(errno, path.string());
+    log("Cannot read the preference %@ of %@: %@", {text(key), text(domain), text(error)});
+  }
+  noteSeen(domain, key, !isUnseen);
   const auto stored = content ? dictionaryWithXMLDescription(*content) : std::nullopt;
   const Value* const found = stored ? stored->find(key) : nullptr;
   return found ? std::optional(*found) : std::nullopt;
 }
 
 void FilePreferences::setValue(std::string_view domain, std::string_view key, const std::optional<Value>& value) {
-  if (const LMRErrorRef error = update(folder_, domain, key, value)) {
+  const bool isSeen = noteSeen(domain, key, true);
+  if (const LMRErrorRef error = update(folder_, domain, key, value, isSeen)) {
     log("Cannot save the preference %@ of %@: %@", {text(key), text(domain), text(error)});
   }
+}
+
+bool FilePreferences::noteSeen(std::string_view domain, std::string_view key, bool isSeen) {
+  const std::lock_guard guard(mutex_);
+  Key unseen{domain, key};
+  if (isSeen) {
+    return unseen_.erase(unseen) == 0;
+  }
+  return unseen_.insert(std::move(unseen)).second;
 }
 
 std::shared_ptr<Preferences> makePreferences() {

@@ -8,7 +8,7 @@
 namespace lumora::backend {
 namespace {
 
-constexpr int cannotStartStatus = 127;
+constexpr int cannotRunStatus = 127;
 
 struct ToolPipes {
   Pipe input;
@@ -35,7 +35,7 @@ struct ToolPipes {
 
 int failed(const std::string& executable, const std::string& reason, std::string& standardError) {
   standardError += executable + ": " + reason;
-  return cannotStartStatus;
+  return cannotRunStatus;
 }
 
 } // namespace
@@ -54,9 +54,14 @@ int PosixToolRunner::run(const std::string& executable, const std::vector<std::s
     return failed(executable, std::generic_category().message(error), standardError);
   }
   pipes.closeChildEnds();
-  ToolExchange(child, {std::move(pipes.input.writeEnd), standardInput},
-               {std::move(pipes.output.readEnd), standardOutput}, {std::move(pipes.error.readEnd), standardError})
-      .run();
+  error =
+      ToolExchange(child, {std::move(pipes.input.writeEnd), standardInput},
+                   {std::move(pipes.output.readEnd), standardOutput}, {std::move(pipes.error.readEnd), standardError})
+          .run();
+  if (error != 0) {
+    const std::string reason = std::generic_category().message(error);
+    return failed(executable, "a part of its input or output was lost: " + reason, standardError);
+  }
   return child.status() >= 0 ? child.status()
                              : failed(executable, "the exit status was taken by another wait", standardError);
 }

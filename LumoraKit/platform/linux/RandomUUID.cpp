@@ -2,6 +2,7 @@
 #include <LumoraKit/platform/Files.h>
 
 #include <array>
+#include <cerrno>
 #include <cstdint>
 
 #include <sys/random.h>
@@ -13,8 +14,11 @@ using UUIDBytes = std::array<std::uint8_t, 16>;
 
 UUIDBytes randomBytes() {
   UUIDBytes bytes{};
-  // The kernel gives up to 256 bytes at once and uninterrupted.
-  const auto count = getrandom(bytes.data(), bytes.size(), 0);
+  ssize_t count = 0;
+  // The kernel gives up to 256 bytes at once; only on a machine that has just started does it wait for them.
+  do {
+    count = getrandom(bytes.data(), bytes.size(), 0);
+  } while (count < 0 && errno == EINTR);
   assertThat(count == static_cast<ssize_t>(bytes.size()), "getrandom gives bytes", "makeUUIDString", "Files");
   return bytes;
 }

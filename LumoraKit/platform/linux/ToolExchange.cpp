@@ -48,9 +48,12 @@ void ToolInput::writeSome(SigPipeGuard& guard) {
   const ssize_t written = write(descriptor_.get(), rest_.data(), rest_.size());
   if (written >= 0) {
     rest_.remove_prefix(static_cast<std::size_t>(written));
-  } else if (!isTemporary(errno)) {
+  } else if (errno == EPIPE) {
     // The child does not want the rest, which is its own business.
     guard.noteBrokenPipe();
+    close();
+  } else if (!isTemporary(errno)) {
+    failure_ = errno;
     close();
   }
   if (rest_.empty()) {
@@ -64,7 +67,10 @@ void ToolOutput::readSome() {
   if (count > 0) {
     makeRoom(text_, static_cast<std::size_t>(count));
     text_.append(buffer.data(), static_cast<std::size_t>(count));
-  } else if (count == 0 || !isTemporary(errno)) {
+  } else if (count == 0) {
+    descriptor_.close();
+  } else if (!isTemporary(errno)) {
+    failure_ = errno;
     descriptor_.close();
   }
 }
@@ -84,10 +90,16 @@ ToolExchange::ToolExchange(ChildProcess& child, ToolInput input, ToolOutput stan
     : child_(child), input_(std::move(input)), standardOutput_(std::move(standardOutput)),
       standardError_(std::move(standardError)) {}
 
-void ToolExchange::run() {
+int ToolExchange::run() {
   while (!isOver()) {
     serveOnce();
   }
+  for (const int failure : {input_.failure(), standardOutput_.failure(), standardError_.failure()}) {
+    if (failure != 0) {
+      return failure;
+    }
+  }
+  return 0;
 }
 
 bool ToolExchange::isOver() const {

@@ -20,10 +20,13 @@ public:
   int descriptor() const { return descriptor_.get(); }
   void writeSome(SigPipeGuard& guard);
   void close() { descriptor_.close(); }
+  /// Why a part of the text was lost on its way (an errno); 0 when the child got it all, or wanted no more.
+  int failure() const { return failure_; }
 
 private:
   FileDescriptor descriptor_;
   std::string_view rest_;
+  int failure_ = 0;
 };
 
 /// This side of one of a child's outputs: collects everything until the last writer has closed it.
@@ -37,10 +40,13 @@ public:
   void readSome();
   /// Reads what is in the pipe at this moment.
   void readWhatIsThere();
+  /// Why the rest was lost (an errno); 0 when nothing was.
+  int failure() const { return failure_; }
 
 private:
   FileDescriptor descriptor_;
   std::string& text_;
+  int failure_ = 0;
 };
 
 /// Feeds a running child and collects its outputs, all at once, until the child has ended and its outputs are closed.
@@ -49,8 +55,8 @@ private:
 class ToolExchange {
 public:
   ToolExchange(ChildProcess& child, ToolInput input, ToolOutput standardOutput, ToolOutput standardError);
-  /// Blocks.
-  void run();
+  /// Blocks. 0, or the errno that says why something was lost on its way.
+  int run();
 
 private:
   using Clock = std::chrono::steady_clock;

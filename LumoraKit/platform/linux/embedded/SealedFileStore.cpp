@@ -74,9 +74,11 @@ std::shared_ptr<SealedFileStore> SealedFileStore::open(const std::filesystem::pa
     error = credentialError(CredentialError::Failed, "The machine gives no random numbers");
     return nullptr;
   }
-  std::error_code ignored;
-  const auto path = std::filesystem::absolute(file, ignored);
-  if (const LMRErrorRef reason = makeDirectories(path.parent_path(), folderPermissions)) {
+  std::error_code failure;
+  const auto path = std::filesystem::absolute(file, failure);
+  const LMRErrorRef reason = failure ? LMRError::fromErrno(failure.value(), file.string())
+                                     : makeDirectories(path.parent_path(), folderPermissions);
+  if (reason) {
     error = systemError(reason);
     return nullptr;
   }
