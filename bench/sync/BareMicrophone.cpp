@@ -2,55 +2,90 @@
 
 #include "Light.h"
 
-#include <gst/app/gstappsink.h>
-
+#include <array>
 #include <cstdint>
+#include <cstdio>
+#include <cstdlib>
+
+// PipeWire's headers are C, and much of them are macros.
+#pragma GCC diagnostic ignored "-Wpedantic"
+#pragma GCC diagnostic ignored "-Wold-style-cast"
+#pragma GCC diagnostic ignored "-Wmissing-field-initializers"
+#include <pipewire/pipewire.h>
+#include <spa/param/audio/format-utils.h>
 
 namespace lumora::bench {
+namespace {
 
-BareMicrophone::BareMicrophone() {
-  gst_init(nullptr, nullptr);
-  pipeline_ = gst_parse_launch("pulsesrc device=lumora_microphone provide-clock=false latency-time=10000 ! "
-                               "audio/x-raw,format=S16LE,rate=48000,channels=1 ! appsink name=sink sync=false",
-                               nullptr);
-  GstClock* const clock = gst_system_clock_obtain();
-  gst_pipeline_use_clock(GST_PIPELINE(pipeline_), clock);
-  gst_object_unref(clock);
-  GstElement* const sink = gst_bin_get_by_name(GST_BIN(pipeline_), "sink");
-  GstAppSinkCallbacks callbacks{};
-  callbacks.new_sample = [](GstAppSink* appSink, gpointer self) {
-    GstSample* const sample = gst_app_sink_pull_sample(appSink);
-    if (sample) {
-      static_cast<BareMicrophone*>(self)->listen(*sample);
-      gst_sample_unref(sample);
+constexpr HostTime second = 1'000'000'000;
+constexpr HostTime rate = 48'000;
+
+} // namespace
+
+struct BareMicrophone::Stream {
+  BareMicrophone& owner;
+  pw_thread_loop* thread = nullptr;
+  pw_stream* stream = nullptr;
+
+  // Within the cycle that brought the sound, whose time is that of its end.
+  static void process(void* data) {
+    auto& self = *static_cast<Stream*>(data);
+    pw_time time{};
+    pw_stream_get_time_n(self.stream, &time, sizeof time);
+    if (pw_buffer* const buffer = pw_stream_dequeue_buffer(self.stream)) {
+      const spa_data& sound = buffer->buffer->datas[0];
+      const auto* const samples = static_cast<const float*>(sound.data) + sound.chunk->offset / sizeof(float);
+      self.owner.listen({samples, samples + sound.chunk->size / sizeof(float)}, static_cast<HostTime>(time.now));
+      pw_stream_queue_buffer(self.stream, buffer);
     }
-    return GST_FLOW_OK;
-  };
-  gst_app_sink_set_callbacks(GST_APP_SINK(sink), &callbacks, this, nullptr);
-  gst_object_unref(sink);
-  gst_element_set_state(pipeline_, GST_STATE_PLAYING);
+  }
+};
+
+BareMicrophone::BareMicrophone() : stream_(std::make_unique<Stream>(Stream{*this})) {
+  static const pw_stream_events events = [] {
+    pw_stream_events result{};
+    result.version = PW_VERSION_STREAM_EVENTS;
+    result.process = Stream::process;
+    return result;
+  }();
+  pw_init(nullptr, nullptr);
+  stream_->thread = pw_thread_loop_new("bare microphone", nullptr);
+  stream_->stream = pw_stream_new_simple(pw_thread_loop_get_loop(stream_->thread), "bare microphone",
+                                         pw_properties_new(PW_KEY_MEDIA_TYPE, "Audio", PW_KEY_MEDIA_CATEGORY, "Capture",
+                                                           PW_KEY_TARGET_OBJECT, "lumora_microphone", nullptr),
+                                         &events, stream_.get());
+  std::array<std::uint8_t, 1024> bytes{};
+  spa_pod_builder builder{};
+  spa_pod_builder_init(&builder, bytes.data(), static_cast<std::uint32_t>(bytes.size()));
+  spa_audio_info_raw format{};
+  format.format = SPA_AUDIO_FORMAT_F32;
+  format.rate = rate;
+  format.channels = 1;
+  std::array<const spa_pod*, 1> offer{spa_format_audio_raw_build(&builder, SPA_PARAM_EnumFormat, &format)};
+  const auto flags =
+      static_cast<pw_stream_flags>(PW_STREAM_FLAG_AUTOCONNECT | PW_STREAM_FLAG_MAP_BUFFERS | PW_STREAM_FLAG_RT_PROCESS);
+  if (pw_stream_connect(stream_->stream, PW_DIRECTION_INPUT, PW_ID_ANY, flags, offer.data(), offer.size()) < 0 ||
+      pw_thread_loop_start(stream_->thread) < 0) {
+    std::fprintf(stderr, "The bare microphone does not start\n");
+    std::exit(EXIT_FAILURE);
+  }
 }
 
 BareMicrophone::~BareMicrophone() {
-  gst_element_set_state(pipeline_, GST_STATE_NULL);
-  gst_object_unref(pipeline_);
+  pw_thread_loop_stop(stream_->thread);
+  pw_stream_destroy(stream_->stream);
+  pw_thread_loop_destroy(stream_->thread);
 }
 
 // A beep lasts longer than it takes to be recognised: only its first time counts.
-void BareMicrophone::listen(GstSample& sample) {
-  GstBuffer* const buffer = gst_sample_get_buffer(&sample);
-  const HostTime time = gst_element_get_base_time(pipeline_) + GST_BUFFER_PTS(buffer);
-  GstMapInfo map;
-  gst_buffer_map(buffer, &map, GST_MAP_READ);
-  const auto* const frames = reinterpret_cast<const std::int16_t*>(map.data);
-  for (std::size_t i = 0; i < map.size / sizeof *frames; ++i) {
-    const HostTime at = time + i * 1'000'000'000 / 48'000 - BeepFinder::lag * 1'000'000'000 / 48'000;
-    if (finder_.feed(frames[i] / 32'768.0) && light::age(at) < light::length) {
+void BareMicrophone::listen(const std::vector<float>& samples, HostTime end) {
+  for (std::size_t i = 0; i < samples.size(); ++i) {
+    const HostTime at = end - (samples.size() - i + BeepFinder::lag) * second / rate;
+    if (finder_.feed(samples[i]) && light::age(at) < light::length) {
       const std::lock_guard lock(mutex_);
       delays_.try_emplace(at - light::age(at), static_cast<double>(light::age(at)) / 1e9);
     }
   }
-  gst_buffer_unmap(buffer, &map);
 }
 
 std::map<HostTime, double> BareMicrophone::delays() const {

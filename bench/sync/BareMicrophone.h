@@ -4,15 +4,15 @@
 
 #include <LumoraKit/platform/MediaCapture.h>
 
-#include <gst/gst.h>
-
 #include <map>
+#include <memory>
 #include <mutex>
+#include <vector>
 
 namespace lumora::bench {
 
-/// Listens to the headless microphone beside the recorder, with nothing but the sound server's own source: how late it
-/// has the beeps is the way through the sound server, of which the recorder knows nothing.
+/// Listens to the headless microphone beside the recorder, as a bare client of PipeWire and by PipeWire's own times:
+/// how late it has the beeps is their way to the microphone, of which a recorder can know nothing.
 class BareMicrophone {
 public:
   BareMicrophone();
@@ -24,9 +24,11 @@ public:
   std::map<HostTime, double> delays() const;
 
 private:
-  void listen(GstSample& sample);
+  struct Stream;
 
-  GstElement* pipeline_;
+  void listen(const std::vector<float>& samples, HostTime end);
+
+  std::unique_ptr<Stream> stream_;
   mutable std::mutex mutex_;
   std::map<HostTime, double> delays_;
   BeepFinder finder_;

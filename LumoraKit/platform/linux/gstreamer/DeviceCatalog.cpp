@@ -1,4 +1,5 @@
 #include <LumoraKit/platform/Log.h>
+#include <LumoraKit/platform/linux/gstreamer/ArrivalStamp.h>
 #include <LumoraKit/platform/linux/gstreamer/CaptureError.h>
 #include <LumoraKit/platform/linux/gstreamer/DelegateCall.h>
 #include <LumoraKit/platform/linux/gstreamer/DeviceCatalog.h>
@@ -25,8 +26,11 @@ void prepareSound(CaptureSource& source) {
   GstPtr<gchar> device;
   g_object_get(source.element.get(), "device", static_cast<gchar**>(GstOut(device)), nullptr);
   source.soundDevice = device ? device.get() : "";
-  // 10 ms a buffer; the device must not offer its own clock.
+  // 10 ms a buffer. The source's own ways to follow a clock are off by up to a buffer from the start, and by 200 ms in
+  // the end.
   g_object_set(source.element.get(), "provide-clock", FALSE, "latency-time", gint64{10'000}, nullptr);
+  gst_util_set_object_arg(G_OBJECT(source.element.get()), "slave-method", "none");
+  stampByArrival(*source.element);
   source.caps.reset(gst_caps_from_string(soundFormat));
 }
 

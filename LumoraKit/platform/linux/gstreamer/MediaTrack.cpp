@@ -79,7 +79,12 @@ public:
       if (piece.silence != 0) {
         result.push_back(place(silence(piece.silence), caps, piece.position, piece.silence));
       }
-      result.push_back(place(region(*buffer, piece), caps, piece.position + piece.silence, piece.count));
+      std::uint64_t position = piece.position + piece.silence;
+      if (piece.repeats != 0) {
+        result.push_back(place(region(*buffer, piece.first, piece.repeats), caps, position, piece.repeats));
+        position += piece.repeats;
+      }
+      result.push_back(place(region(*buffer, piece.first, piece.count), caps, position, piece.count));
     }
     return result;
   }
@@ -96,9 +101,9 @@ private:
     return makeSample(std::move(buffer), caps, cutter_.fileTime(position), cutter_.duration(frames));
   }
 
-  GstPtr<GstBuffer> region(GstBuffer& buffer, const AudioCutter::Piece& piece) const {
+  GstPtr<GstBuffer> region(GstBuffer& buffer, std::uint64_t first, std::uint64_t count) const {
     return GstPtr<GstBuffer>(
-        gst_buffer_copy_region(&buffer, GST_BUFFER_COPY_ALL, piece.first * frameSize(), piece.count * frameSize()));
+        gst_buffer_copy_region(&buffer, GST_BUFFER_COPY_ALL, first * frameSize(), count * frameSize()));
   }
 
   GstPtr<GstBuffer> silence(std::uint64_t frames) const {
