@@ -20,7 +20,8 @@ public:
   HeadlessDevices& operator=(const HeadlessDevices&) = delete;
   ~HeadlessDevices();
 
-  /// `kind`: "camera", "microphone", "silent-camera", "stuck-camera" or "picture" (something to see on the screen).
+  /// `kind`: "camera", "microphone", "silent-camera", "stuck-camera", "picture" (something to see on the screen) or
+  /// "noise" (something to hear for the microphones).
   /// True when the device is there.
   bool add(const std::string& kind, const std::string& name);
   /// Unplugs a device; true when it is gone. The first ones are "lumora_camera" and "lumora_microphone".

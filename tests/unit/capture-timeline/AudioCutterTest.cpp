@@ -66,8 +66,8 @@ TEST(AudioCutter, countsFrames_whenTimeStampsJitter) {
   AudioCutter cutter(rate, 0);
   Pieces all;
   for (std::uint64_t i = 0; i < 100; ++i) {
-    const std::uint64_t jitter = (i + 1) % 3 * 4 * millisecond;
-    const Pieces pieces = cutter.cut(timeline, start + i * 10 * millisecond + jitter - 4 * millisecond, framesABuffer);
+    const std::uint64_t jitter = (i + 1) % 3 * 2 * millisecond;
+    const Pieces pieces = cutter.cut(timeline, start + i * 10 * millisecond + jitter - 2 * millisecond, framesABuffer);
     all.insert(all.end(), pieces.begin(), pieces.end());
   }
   EXPECT_EQ(total(all), 100 * framesABuffer);

@@ -8,10 +8,10 @@ namespace {
 
 constexpr std::uint64_t second = 1'000'000'000;
 
-// Time stamps of sound jitter by some milliseconds while the samples themselves are continuous: within this the
-// count of frames is believed, beyond it something was lost or repeated. At a start and after a pause the time stamp
-// alone says where the sound belongs.
-constexpr std::int64_t jitterMilliseconds = 20;
+// Time stamps of sound jitter a little while the samples themselves are continuous: within this the count of frames is
+// believed, beyond it something was lost or repeated. At a start and after a pause the time stamp alone says where the
+// sound belongs.
+constexpr std::int64_t jitterMilliseconds = 5;
 
 // What the time stamps say on the average is the device's own speed, and is followed.
 constexpr double slipMilliseconds = 1;
