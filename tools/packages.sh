@@ -37,6 +37,7 @@ site_packages=(doxygen python3)
 package_packages=(dpkg-dev file lintian desktop-file-utils appstream debootstrap)
 check_packages=(clang-format-14 git python3)
 lint_packages=(clang-14 clang-tidy-14 libclang-rt-14-dev python3)
+coverage_packages=(llvm-14)
 
 # install_packages NAME...: installs those that are missing, and says nothing when none is.
 install_packages() {

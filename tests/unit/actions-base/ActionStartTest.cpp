@@ -102,6 +102,19 @@ TEST(ActionStartDeathTest, stopsTheProcess_whenStartedAfterTheEnd) {
   EXPECT_DEATH(action->start(), "an action is run once, in start of KTAction");
 }
 
+TEST(ActionStart, startsItsParts_whenTheActionIsMadeOfOthers) {
+  const auto part = SampleAction::failing();
+  const auto listener = listenerOf(*part);
+  const auto whole = SampleAction::composite([&](SampleAction& self) {
+    self.runPart(part);
+    listener->note("part started");
+    self.end();
+  });
+  whole->start();
+  EXPECT_TRUE(serveUntil([&] { return !part->isRunning() && !whole->isRunning(); }));
+  EXPECT_THAT(listener->events, testing::ElementsAre("part started", "failed"));
+}
+
 TEST(ActionStart, carriesWhatTheCallerSet_whenEnded) {
   const auto action = SampleAction::succeeding();
   EXPECT_EQ(action->description(), "");

@@ -105,6 +105,7 @@ std::vector<Accepted> strings() {
 std::vector<Accepted> otherValues() {
   return {
       body("true", "<true/>", true),
+      body("carriageReturnOutsideAValue", "&#13;<true/>&#13;", true),
       body("falseInTwoTags", "<false></false>", false),
       body("date", "<date>2010-01-20T15:04:05Z</date>", Date(1263999845s)),
       body("epoch", "<date>1970-01-01T00:00:00Z</date>", Date(0s)),

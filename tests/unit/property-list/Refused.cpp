@@ -339,6 +339,13 @@ TEST(PropertyListReader, cutsTheText_whenABadValueIsLong) {
               testing::EndsWith("\"" + repeated("\u00e9", 20) + "...\" is not a 64-bit integer"));
 }
 
+TEST(PropertyListReader, cutsTheTextBetweenTwoCharacters_whenABadValueIsLong) {
+  LMRErrorRef error;
+  EXPECT_FALSE(valueWithXMLDescription(documentOf("<real>" + repeated("\u20ac", 1000) + "</real>"), &error));
+  EXPECT_THAT(error->localizedDescription(),
+              testing::EndsWith("\"" + repeated("\u20ac", 13) + "...\" is not a real number"));
+}
+
 TEST(PropertyListReader, refusesTheRoot_whenADictionaryIsAskedForAndItIsAnother) {
   for (const std::string_view root : {"<array/>", "<string/>", "<integer>1</integer>", "<true/>"}) {
     LMRErrorRef error;
