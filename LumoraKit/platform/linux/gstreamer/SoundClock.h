@@ -9,7 +9,7 @@
 namespace lumora::backend {
 
 /// Puts the sound of a device, which a sound server counts in samples, on the host clock. Blocks arrive when they are
-/// complete or later, never sooner: those of the last two seconds that came soonest after their last sample tell where
+/// complete or later, never sooner: those of the last half second that came soonest after their last sample tell where
 /// the count is. So a device that counts faster or slower than the host's seconds is followed, and samples that the
 /// server has lost are noticed. Not thread safe.
 class LUMORA_INTERNAL SoundClock {
@@ -20,10 +20,10 @@ public:
 
 private:
   static constexpr std::int64_t never = std::numeric_limits<std::int64_t>::max();
-  static constexpr HostTime slotLength = 500'000'000;
+  static constexpr HostTime slotLength = 100'000'000;
 
-  // The least of arrival less end in each of the last half seconds, the newest first.
-  std::array<std::int64_t, 4> leastLags_{never, never, never, never};
+  // The least of arrival less end in each of the last tenths of a second, the newest first.
+  std::array<std::int64_t, 5> leastLags_{never, never, never, never, never};
   HostTime slotBegin_ = 0;
 };
 
