@@ -45,7 +45,7 @@ std::string barePipelines(const Paths& files) {
         "video/x-raw,width=1280,height=720,framerate=30/1 ! queue ! videoconvertscale ! video/x-raw,format=I420 ! "
         "x264enc speed-preset=superfast tune=zerolatency key-int-max=24 option-string=scenecut=0 bitrate=4000 ! "
         "video/x-h264,profile=high ! "
-        "h264parse ! queue ! mux. pulsesrc device=lumora_microphone latency-time=10000 num-buffers=1000 ! "
+        "h264parse ! queue ! mux. pulsesrc device=lumora_microphone latency-time=20000 num-buffers=500 ! "
         "audio/x-raw,format=S16LE,rate=48000,channels=2 ! queue ! audioconvert ! avenc_aac bitrate=128000 ! "
         "aacparse ! queue ! mux. qtmux name=mux fragment-duration=800 fragment-mode=dash-or-mss ! "
         "filesink buffer-mode=unbuffered location='" +

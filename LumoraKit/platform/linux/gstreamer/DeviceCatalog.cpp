@@ -26,9 +26,9 @@ void prepareSound(CaptureSource& source) {
   GstPtr<gchar> device;
   g_object_get(source.element.get(), "device", static_cast<gchar**>(GstOut(device)), nullptr);
   source.soundDevice = device ? device.get() : "";
-  // 10 ms a buffer. The source's own ways to follow a clock are off by up to a buffer from the start, and by 200 ms in
-  // the end.
-  g_object_set(source.element.get(), "provide-clock", FALSE, "latency-time", gint64{10'000}, nullptr);
+  // 20 ms a buffer: asked for less, the sound server of a busy machine loses some. The source's own ways to follow a
+  // clock are off by up to a buffer from the start, and by 200 ms in the end.
+  g_object_set(source.element.get(), "provide-clock", FALSE, "latency-time", gint64{20'000}, nullptr);
   gst_util_set_object_arg(G_OBJECT(source.element.get()), "slave-method", "none");
   stampByArrival(*source.element);
   source.caps.reset(gst_caps_from_string(soundFormat));

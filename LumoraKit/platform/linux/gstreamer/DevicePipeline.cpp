@@ -19,7 +19,7 @@ constexpr HostTime plausibleLead = 100'000'000;
 
 // Samples that wait for a busy delegate, before the oldest is dropped: a second of video, two of sound.
 constexpr guint videoSamplesInQueue = 30;
-constexpr guint soundSamplesInQueue = 200;
+constexpr guint soundSamplesInQueue = 100;
 
 GstElement* make(const char* factory) {
   return gst_element_factory_make(factory, nullptr);
