@@ -76,8 +76,8 @@ inline constexpr std::array textTable{
     TextEntry{"&Title", "&Titel", "&Titre", "&Título", "タイトル(&T)"},
     TextEntry{"&Description", "&Beschreibung", "&Description", "&Descripción", "説明(&D)"},
     TextEntry{"Recording of %1", "Aufnahme vom %1", "Enregistrement du %1", "Grabación del %1", "%1 の収録"},
-    // A date, in Qt's letters.
-    TextEntry{"d MMMM yyyy", "d. MMMM yyyy", "d MMMM yyyy", "d 'de' MMMM 'de' yyyy", "yyyy年M月d日"},
+    // A date, in Qt's letters; all of the title is to be seen in its field.
+    TextEntry{"d MMMM yyyy", "d.M.yyyy", "d/M/yyyy", "d/M/yyyy", "yyyy年M月d日"},
     TextEntry{"Asking the server…", "Server wird gefragt …", "Interrogation du serveur…", "Preguntando al servidor…",
               "サーバに問い合わせています…"},
     TextEntry{"No workflow", "Kein Arbeitsablauf", "Aucun flux de travail", "Ningún flujo de trabajo",

@@ -52,6 +52,10 @@ QSize LevelView::sizeHint() const {
 void LevelView::paintEvent(QPaintEvent*) {
   QPainter painter(this);
   painter.setRenderHint(QPainter::Antialiasing);
+  if (layoutDirection() == Qt::RightToLeft) {
+    painter.translate(width(), 0);
+    painter.scale(-1, 1);
+  }
   painter.setPen(Qt::NoPen);
   QLinearGradient colours(0, 0, width(), 0);
   colours.setColorAt(0, colourOf(Signal::Good, palette()));

@@ -14,7 +14,7 @@ namespace {
 
 constexpr std::chrono::milliseconds interval{66};
 constexpr int margin = 16;
-constexpr int sidebarCharacters = 34;
+constexpr int sidebarCharacters = 38;
 
 } // namespace
 

@@ -2,6 +2,7 @@
 
 #include "recorder/window/Colours.h"
 #include "recorder/window/Icons.h"
+#include "recorder/window/LineDelegate.h"
 #include "recorder/window/Words.h"
 
 #include <QHBoxLayout>
@@ -42,10 +43,11 @@ void SubmissionList::build() {
   label->setBuddy(list_);
   list_->setObjectName("submissions");
   list_->setAccessibleName(words("Submissions"));
+  list_->setItemDelegate(new LineDelegate(list_));
+  // Also asks for the lines' heights anew when a scroll bar leaves them less room.
   list_->setWordWrap(true);
   list_->setIconSize(QSize(fontMetrics().ascent(), fontMetrics().ascent()));
   list_->setSpacing(3);
-  list_->setTextElideMode(Qt::ElideRight);
   list_->setHorizontalScrollBarPolicy(Qt::ScrollBarAlwaysOff);
   list_->setMinimumHeight(fontMetrics().height() * 5);
   retry_->setObjectName("submitNow");
