@@ -30,6 +30,14 @@ constexpr const char* button = "push button";
 class KilledRecorder : public testing::Test {
 protected:
   void SetUp() override {
+    // The services that the devices' bus starts are to have this home, too.
+    for (const auto& [name, value] :
+         {std::pair("XDG_DATA_HOME", (home_ / "data").string()),
+          std::pair("XDG_CONFIG_HOME", (home_ / "config").string()), std::pair("LC_ALL", std::string("C.UTF-8")),
+          std::pair("QT_QPA_PLATFORM", std::string("xcb")), std::pair("QT_STYLE_OVERRIDE", std::string("fusion")),
+          std::pair("QT_LINUX_ACCESSIBILITY_ALWAYS_ON", std::string("1"))}) {
+      ::setenv(name, value.c_str(), 1);
+    }
     std::string missing;
     devices_ = lumora::testing::HeadlessDevices::start(missing);
     if (!devices_ || !Movie::canBeRead()) {
@@ -41,13 +49,6 @@ protected:
     manager_ = ChildProgram::start({"jwm"});
     if (!manager_) {
       GTEST_SKIP() << "jwm is not installed";
-    }
-    for (const auto& [name, value] :
-         {std::pair("XDG_DATA_HOME", (home_ / "data").string()),
-          std::pair("XDG_CONFIG_HOME", (home_ / "config").string()), std::pair("LC_ALL", std::string("C.UTF-8")),
-          std::pair("QT_QPA_PLATFORM", std::string("xcb")), std::pair("QT_STYLE_OVERRIDE", std::string("fusion")),
-          std::pair("QT_LINUX_ACCESSIBILITY_ALWAYS_ON", std::string("1"))}) {
-      ::setenv(name, value.c_str(), 1);
     }
     server_.emplace();
     user_.emplace();
