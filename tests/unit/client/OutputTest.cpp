@@ -99,7 +99,7 @@ TEST(TextTest, tellsValuesToPeople) {
   EXPECT_EQ(plainText(false), "no");
   EXPECT_EQ(plainText(-5), "-5");
   EXPECT_EQ(plainText(Array{"a", 1, true}), "a, 1, yes");
-  EXPECT_EQ(plainText(Array{Array{1}}), "[[1]]");
+  EXPECT_EQ(plainText(Array{Value(Array{1})}), "[[1]]");
   EXPECT_EQ(plainText(Dictionary{{"a", "b\n"}}), "{a: b\\n}");
   EXPECT_EQ(plainText(Data(1500)), "1.5 kB of data");
 }

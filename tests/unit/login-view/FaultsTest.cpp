@@ -41,11 +41,12 @@ TEST_F(LoginViewFaultsTest, aServerThatHangs_blocksNothing) {
 TEST_F(LoginViewFaultsTest, repliesOfAnyShape_areUnderstoodOrIgnored) {
   Array nested{"basic"};
   for (int depth = 0; depth < 1000; ++depth) {
-    nested = Array{nested};
+    nested = Array{lumora::Value(nested)};
   }
   for (const lumora::Value& value :
-       {lumora::Value(Array{Array{"basic"}}), lumora::Value(Array{Dictionary{{"basic", true}}}), lumora::Value(nested),
-        lumora::Value(Array(10000, "ntlm")), lumora::Value(Array{1, 2.5, true, lumora::Data{1}})}) {
+       {lumora::Value(Array{lumora::Value(Array{"basic"})}), lumora::Value(Array{Dictionary{{"basic", true}}}),
+        lumora::Value(nested), lumora::Value(Array(10000, "ntlm")),
+        lumora::Value(Array{1, 2.5, true, lumora::Data{1}})}) {
     serverSays({{"http_auth_type", value}});
     controller_ = std::make_shared<LMRServerLoginViewController>();
     ask();
