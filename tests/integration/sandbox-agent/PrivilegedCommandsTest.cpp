@@ -6,6 +6,7 @@
 using lumora::Array;
 using lumora::Dictionary;
 using lumora::HelperAgentError;
+using lumora::Value;
 using lumora::tests::FailedWith;
 using lumora::tests::SandboxServer;
 using lumora::tests::WasSuccessful;
@@ -134,7 +135,7 @@ TEST_F(PrivilegedCommandsTest, loseNothing_whenManyComeAtOnce) {
 }
 
 TEST_F(PrivilegedCommandsTest, areTheOnlyOnesThatTheAgentHasPerformed) {
-  const auto error = refusalOf("listinfo", {{"subarguments", Array{Array{"server", "localhost:8170"}}}});
+  const auto error = refusalOf("listinfo", {{"subarguments", Array{Value(Array{"server", "localhost:8170"})}}});
   ASSERT_TRUE(error);
   EXPECT_EQ(error->code(), static_cast<int>(HelperAgentError::Refused));
   EXPECT_THAT(error->localizedDescription(), testing::HasSubstr("performs no command named listinfo"));
