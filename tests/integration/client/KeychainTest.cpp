@@ -9,14 +9,6 @@ using testing::HasSubstr;
 
 namespace {
 
-// What libsecret leaves behind in the client is known by its name in a leak's stack, which the address sanitizer sees
-// with its slow unwinder only.
-void seeWholeStacksOfLeaks() {
-  if (const char* const options = ::getenv("ASAN_OPTIONS")) {
-    ::setenv("ASAN_OPTIONS", (std::string(options) + ":fast_unwind_on_malloc=0").c_str(), 1);
-  }
-}
-
 /// With a keyring of the user's.
 class KeychainTest : public lumora::tests::ClientTest {
 protected:
@@ -25,7 +17,6 @@ protected:
       GTEST_SKIP() << *obstacle;
     }
     ASSERT_TRUE(keyring_.start());
-    seeWholeStacksOfLeaks();
   }
   // Without the password file that other tests give.
   static ProgramRun runPlainly(const std::vector<std::string>& arguments) {
