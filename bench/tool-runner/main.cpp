@@ -84,7 +84,7 @@ double peakMemoryPerOutput() {
 // Single runs by turns, in random order, and their median: what else the machine does then hurts all sides alike.
 void registerBenchmarks() {
   constexpr int runs = 1000;
-  constexpr int largeRuns = 15;
+  constexpr int largeRuns = 45;
   const auto add = [](const char* name, auto function) {
     return benchmark::RegisterBenchmark(name, function)->Iterations(1);
   };
