@@ -1,18 +1,12 @@
 #include "BareMicrophone.h"
 
 #include "Light.h"
+#include "PipeWire.h"
 
 #include <array>
 #include <cstdint>
 #include <cstdio>
 #include <cstdlib>
-
-// PipeWire's headers are C, and much of them are macros.
-#pragma GCC diagnostic ignored "-Wpedantic"
-#pragma GCC diagnostic ignored "-Wold-style-cast"
-#pragma GCC diagnostic ignored "-Wmissing-field-initializers"
-#include <pipewire/pipewire.h>
-#include <spa/param/audio/format-utils.h>
 
 namespace lumora::bench {
 namespace {

@@ -1,16 +1,11 @@
 #include "Camera.h"
 
+#include "PipeWire.h"
+
 #include <array>
 #include <cstdio>
 #include <cstdlib>
 #include <ctime>
-
-// PipeWire's headers are C, and much of them are macros.
-#pragma GCC diagnostic ignored "-Wpedantic"
-#pragma GCC diagnostic ignored "-Wold-style-cast"
-#pragma GCC diagnostic ignored "-Wmissing-field-initializers"
-#include <pipewire/pipewire.h>
-#include <spa/param/video/format-utils.h>
 
 namespace lumora::bench {
 namespace {

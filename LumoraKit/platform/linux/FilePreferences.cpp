@@ -109,12 +109,12 @@ std::optional<Value> FilePreferences::value(std::string_view domain, std::string
   // Without the lock: a file is only ever replaced as a whole.
   const auto path = folder_ / (fileName(domain) + ".plist");
   const auto content = folder_.empty() ? std::nullopt : contentOfFile(path);
-  const bool isUnseen = !content && !folder_.empty() && errno != ENOENT;
-  if (isUnseen) {
+  const bool isSeen = content || folder_.empty() || errno == ENOENT;
+  if (!isSeen) {
     const LMRErrorRef error = LMRError::fromErrno(errno, path.string());
     log("Cannot read the preference %@ of %@: %@", {text(key), text(domain), text(error)});
   }
-  noteSeen(domain, key, !isUnseen);
+  noteSeen(domain, key, isSeen);
   const auto stored = content ? dictionaryWithXMLDescription(*content) : std::nullopt;
   const Value* const found = stored ? stored->find(key) : nullptr;
   return found ? std::optional(*found) : std::nullopt;

@@ -113,87 +113,75 @@ ssize_t write(int descriptor, const void* data, std::size_t size) {
 
 int fsync(int descriptor) {
   SYSTEMS_OWN(fsync);
-  const int fault = faultOf("fsync", {EIO, ENOSPC, EINTR});
-  FAIL_IF(fault, -1)
+  MAY_FAIL(fsync, -1, EIO, ENOSPC, EINTR)
   // Nothing of a try has to outlive the machine.
   return isFailing() ? 0 : next(descriptor);
 }
 
 int ftruncate(int descriptor, off_t length) noexcept {
   SYSTEMS_OWN(ftruncate);
-  const int fault = faultOf("ftruncate", {EIO, EINTR});
-  FAIL_IF(fault, -1)
+  MAY_FAIL(ftruncate, -1, EIO, EINTR)
   return next(descriptor, length);
 }
 
 int rename(const char* from, const char* to) noexcept {
   SYSTEMS_OWN(rename);
-  const int fault = faultOf("rename", {EIO, ENOSPC, EACCES});
-  FAIL_IF(fault, -1)
+  MAY_FAIL(rename, -1, EIO, ENOSPC, EACCES)
   return next(from, to);
 }
 
 int unlink(const char* path) noexcept {
   SYSTEMS_OWN(unlink);
-  const int fault = faultOf("unlink", {EIO, EACCES});
-  FAIL_IF(fault, -1)
+  MAY_FAIL(unlink, -1, EIO, EACCES)
   return next(path);
 }
 
 int mkdir(const char* path, mode_t permissions) noexcept {
   SYSTEMS_OWN(mkdir);
-  const int fault = faultOf("mkdir", {EIO, ENOSPC, EACCES});
-  FAIL_IF(fault, -1)
+  MAY_FAIL(mkdir, -1, EIO, ENOSPC, EACCES)
   return next(path, permissions);
 }
 
 int stat(const char* path, struct stat* facts) noexcept {
   SYSTEMS_OWN(stat);
-  const int fault = faultOf("stat", {EIO, ENOMEM, EACCES});
-  FAIL_IF(fault, -1)
+  MAY_FAIL(stat, -1, EIO, ENOMEM, EACCES)
   return next(path, facts);
 }
 
 int fstat(int descriptor, struct stat* facts) noexcept {
   SYSTEMS_OWN(fstat);
-  const int fault = faultOf("fstat", {EIO, ENOMEM});
-  FAIL_IF(fault, -1)
+  MAY_FAIL(fstat, -1, EIO, ENOMEM)
   return next(descriptor, facts);
 }
 
 // Libraries that can read large files call these two.
 int stat64(const char* path, struct stat64* facts) noexcept {
   SYSTEMS_OWN(stat64);
-  const int fault = faultOf("stat64", {EIO, ENOMEM, EACCES});
-  FAIL_IF(fault, -1)
+  MAY_FAIL(stat64, -1, EIO, ENOMEM, EACCES)
   return next(path, facts);
 }
 
 int fstat64(int descriptor, struct stat64* facts) noexcept {
   SYSTEMS_OWN(fstat64);
-  const int fault = faultOf("fstat64", {EIO, ENOMEM});
-  FAIL_IF(fault, -1)
+  MAY_FAIL(fstat64, -1, EIO, ENOMEM)
   return next(descriptor, facts);
 }
 
 DIR* fdopendir(int descriptor) {
   SYSTEMS_OWN(fdopendir);
-  const int fault = faultOf("fdopendir", {ENOMEM});
-  FAIL_IF(fault, nullptr)
+  MAY_FAIL(fdopendir, nullptr, ENOMEM)
   return next(descriptor);
 }
 
 struct dirent* readdir(DIR* folder) {
   SYSTEMS_OWN(readdir);
-  const int fault = faultOf("readdir", {EIO});
-  FAIL_IF(fault, nullptr)
+  MAY_FAIL(readdir, nullptr, EIO)
   return next(folder);
 }
 
 char* getcwd(char* buffer, std::size_t size) noexcept {
   SYSTEMS_OWN(getcwd);
-  const int fault = faultOf("getcwd", {ENOENT, ENOMEM});
-  FAIL_IF(fault, nullptr)
+  MAY_FAIL(getcwd, nullptr, ENOENT, ENOMEM)
   return next(buffer, size);
 }
 

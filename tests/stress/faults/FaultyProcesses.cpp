@@ -23,29 +23,25 @@ extern "C" {
 // The kernel's numbers are there at once, but for the first seconds of a machine.
 ssize_t getrandom(void* buffer, std::size_t size, unsigned flags) {
   SYSTEMS_OWN(getrandom);
-  const int fault = faultOf("getrandom", {EINTR});
-  FAIL_IF(fault, -1)
+  MAY_FAIL(getrandom, -1, EINTR)
   return next(buffer, size, flags);
 }
 
 void* mmap(void* address, std::size_t size, int protection, int flags, int descriptor, off_t offset) noexcept {
   SYSTEMS_OWN(mmap);
-  const int fault = faultOf("mmap", {ENOMEM});
-  FAIL_IF(fault, MAP_FAILED)
+  MAY_FAIL(mmap, MAP_FAILED, ENOMEM)
   return next(address, size, protection, flags, descriptor, offset);
 }
 
 int pipe2(int* ends, int flags) noexcept {
   SYSTEMS_OWN(pipe2);
-  const int fault = faultOf("pipe2", {EMFILE, ENFILE});
-  FAIL_IF(fault, -1)
+  MAY_FAIL(pipe2, -1, EMFILE, ENFILE)
   return next(ends, flags);
 }
 
 int poll(struct pollfd* descriptors, nfds_t count, int timeout) {
   SYSTEMS_OWN(poll);
-  const int fault = faultOf("poll", {EINTR, ENOMEM});
-  FAIL_IF(fault, -1)
+  MAY_FAIL(poll, -1, EINTR, ENOMEM)
   return next(descriptors, count, timeout);
 }
 
@@ -82,8 +78,7 @@ pid_t waitpid(pid_t process, int* status, int options) {
 
 int sigtimedwait(const sigset_t* signals, siginfo_t* facts, const timespec* timeout) {
   SYSTEMS_OWN(sigtimedwait);
-  const int fault = faultOf("sigtimedwait", {EINTR});
-  FAIL_IF(fault, -1)
+  MAY_FAIL(sigtimedwait, -1, EINTR)
   return next(signals, facts, timeout);
 }
 

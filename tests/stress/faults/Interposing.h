@@ -59,6 +59,9 @@ template <class Result> Result failWith(int error, Result result) {
 
 /// Returns when the call is to fail.
 #define FAIL_IF(fault, result)                                                                                         \
-  if ((fault) != none) {                                                                                               \
-    return failWith(fault, result);                                                                                    \
+  if (const int way = (fault); way != none) {                                                                          \
+    return failWith(way, result);                                                                                      \
   }
+
+/// Returns when the call of the function is to fail, in one of these ways.
+#define MAY_FAIL(function, result, ...) FAIL_IF(faultOf(#function, {__VA_ARGS__}), result)
