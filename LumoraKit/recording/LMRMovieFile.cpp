@@ -42,7 +42,7 @@ public:
     if (isTooLong_) {
       return "It has more parts than any recording";
     }
-    if (!hasType_ || !index_) {
+    if (!index_) {
       return "It has no complete index of a movie";
     }
     if (index_->isFragmented && !hasFragment_) {
@@ -99,8 +99,8 @@ private:
   }
 
   bool takeIndex(const std::string& content) {
-    // A second one would say something else of the fragments so far.
-    if (index_) {
+    // The type stands before it. A second index would say something else of the fragments so far.
+    if (!hasType_ || index_) {
       return false;
     }
     index_ = lumora::movieIndex(content);

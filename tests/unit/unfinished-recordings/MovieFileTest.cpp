@@ -1,4 +1,4 @@
-#include "Boxes.h"
+#include "support/Boxes.h"
 #include "support/TemporaryFolder.h"
 
 #include <LumoraKit/recording/LMRMovieFile.h>

@@ -1,4 +1,4 @@
-#include "Boxes.h"
+#include "support/Boxes.h"
 #include "support/Sessions.h"
 
 #include <LumoraKit/actions/LMRMetadataKeys.h>
