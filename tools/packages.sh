@@ -1,7 +1,7 @@
 # The Debian packages that each use of the project needs, and how they are installed. Sourced by ./dev.
 
 build_packages=(
-  g++ cmake ninja-build ccache pkg-config
+  g++ make cmake ninja-build ccache pkg-config
   libglib2.0-dev libexpat1-dev libpugixml-dev libsqlite3-dev libsqlitecpp-dev libsodium-dev libcli11-dev libpng-dev libkrb5-dev
   libsecret-1-dev libx11-dev
   libgstreamer1.0-dev libgstreamer-plugins-base1.0-dev
