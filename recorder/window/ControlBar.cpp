@@ -1,6 +1,7 @@
 #include "recorder/window/ControlBar.h"
 
 #include "recorder/window/Colours.h"
+#include "recorder/window/IconButton.h"
 #include "recorder/window/Icons.h"
 #include "recorder/window/Words.h"
 
@@ -59,7 +60,7 @@ ControlBar::ControlBar(std::shared_ptr<Studio> studio, QWidget* parent)
 }
 
 QPushButton* ControlBar::makeButton(const char* name, Text label) {
-  auto* const button = new QPushButton(words(label), this);
+  auto* const button = new IconButton(words(label), this);
   button->setObjectName(name);
   button->setAutoDefault(true);
   return button;
