@@ -1,4 +1,5 @@
 #include "recorder/window/RecorderWindow.h"
+#include "recorder/window/Words.h"
 
 #include <LumoraKit/LumoraKit.h>
 #include <LumoraKit/platform/qt/LumoraKitQt.h>
@@ -28,6 +29,9 @@ int main(int argc, char** argv) {
         std::make_shared<lumora::RootedToolRunner>(parser.value("sandbox").toStdString(), platform.toolRunner);
     lumora::Platform::install(platform);
   }
+  // As the texts run: a language without texts here is shown in English.
+  const bool isRightToLeft = recorder::words("Record").isRightToLeft();
+  QApplication::setLayoutDirection(isRightToLeft ? Qt::RightToLeft : Qt::LeftToRight);
   recorder::RecorderWindow window;
   window.show();
   window.logIn();

@@ -16,7 +16,10 @@ std::string_view inLanguage(const TextEntry& entry, std::string_view language) {
   if (main == "es") {
     return entry.spanish;
   }
-  return main == "ja" ? entry.japanese : entry.english;
+  if (main == "ja") {
+    return entry.japanese;
+  }
+  return main == "ar" ? entry.arabic : entry.english;
 }
 
 } // namespace

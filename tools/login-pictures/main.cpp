@@ -3,6 +3,7 @@
 #include <QApplication>
 #include <QCommandLineParser>
 #include <QFontInfo>
+#include <QLocale>
 #include <QPalette>
 #include <QProxyStyle>
 #include <QStyleFactory>
@@ -45,7 +46,6 @@ int main(int argc, char** argv) {
                      {"dark", "a dark palette"},
                      {"large", "a font of twice the size"},
                      {"language", "the user's language", "tag", "en"},
-                     {"right-to-left", "mirrored"},
                      {"states", "only these, separated by commas", "names"}});
   parser.process(application);
   if (parser.positionalArguments().size() != 1) {
@@ -64,9 +64,7 @@ int main(int argc, char** argv) {
   font.setPixelSize(parser.isSet("large") ? 24 : 12);
   QApplication::setFont(font);
   QApplication::setCursorFlashTime(0); // the cursor is always seen
-  if (parser.isSet("right-to-left")) {
-    QApplication::setLayoutDirection(Qt::RightToLeft);
-  }
+  QApplication::setLayoutDirection(QLocale(parser.value("language")).textDirection());
   pictures::Pictures all({.folder = parser.positionalArguments().front(),
                           .name = parser.value("name"),
                           .language = parser.value("language").toStdString(),

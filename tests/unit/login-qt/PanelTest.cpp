@@ -167,7 +167,7 @@ TEST_F(PanelQtTest, texts_areThoseOfTheUsersLanguage) {
 }
 
 TEST_F(PanelQtTest, labelsAndCheckBox_haveRoomInEveryLanguage) {
-  for (const char* const language : {"en", "de", "fr", "es", "ja"}) {
+  for (const char* const language : {"en", "de", "fr", "es", "ja", "ar"}) {
     platform_.application->setLanguage(language);
     sheet_ = std::make_shared<LMRServerLoginSheetController>();
     begin();

@@ -35,7 +35,7 @@ std::string keyOf(std::string_view text) {
 
 TEST(Texts, areThereInAllLanguages_withTheSamePlaces) {
   for (const TextEntry& entry : textTable) {
-    for (const std::string_view each : {entry.german, entry.french, entry.spanish, entry.japanese}) {
+    for (const std::string_view each : {entry.german, entry.french, entry.spanish, entry.japanese, entry.arabic}) {
       EXPECT_FALSE(each.empty()) << entry.english;
       EXPECT_EQ(marksOf(each), marksOf(entry.english)) << each;
     }
@@ -58,8 +58,8 @@ TEST(Texts, leadToOneThingEach_byTheirKeys) {
   const std::set<std::string_view> settings{
       "&Folder for recordings:", "&Quality:", "&Encoder:", "&Camera:", "&Microphone:"};
   for (const auto& group : {window, applicationMenu, recordingMenu, settings}) {
-    for (const auto language :
-         {&TextEntry::english, &TextEntry::german, &TextEntry::french, &TextEntry::spanish, &TextEntry::japanese}) {
+    for (const auto language : {&TextEntry::english, &TextEntry::german, &TextEntry::french, &TextEntry::spanish,
+                                &TextEntry::japanese, &TextEntry::arabic}) {
       std::set<std::string> keys;
       for (const TextEntry& entry : textTable) {
         if (group.contains(entry.english)) {
@@ -76,7 +76,7 @@ TEST(Texts, followTheLanguageOfTheApplication) {
   EXPECT_EQ(text("Record"), "Record");
   for (const auto& [language, expected] :
        {std::pair("de-AT", "Aufnehmen"), std::pair("fr", "Enregistrer"), std::pair("es", "Grabar"),
-        std::pair("ja", "収録"), std::pair("nl", "Record")}) {
+        std::pair("ja", "収録"), std::pair("ar-EG", "تسجيل"), std::pair("nl", "Record")}) {
     platform.application->setLanguage(language);
     EXPECT_EQ(text("Record"), expected);
   }
