@@ -136,7 +136,7 @@ void FakeMovieFileOutput::runOutOfDiskSpace() {
   endWithError(captureError(CaptureErrorCode::DiskFull, "No space is left for the recording"));
 }
 
-bool FakeMovieFileOutput::emit(const SampleBuffer& sample, const std::shared_ptr<CaptureConnection>& connection) {
+bool FakeMovieFileOutput::emitSample(const SampleBuffer& sample, const std::shared_ptr<CaptureConnection>& connection) {
   std::shared_ptr<FakeCaptureSession> session;
   std::shared_ptr<MovieFileOutputDelegate> delegate;
   {
@@ -158,7 +158,7 @@ bool FakeMovieFileOutput::emitSample(MediaType type, std::optional<HostTime> hos
   const auto found = std::find_if(all.begin(), all.end(), [type](const auto& connection) {
     return connection->mediaType() == type && connection->isEnabled();
   });
-  return found != all.end() && emit(FakeSampleBuffer(hostTime), *found);
+  return found != all.end() && emitSample(FakeSampleBuffer(hostTime), *found);
 }
 
 int FakeMovieFileOutput::deliverOutcomes() {

@@ -68,7 +68,7 @@ public:
 
   /// Shows a sample to the delegate, on the calling thread. False when nothing was shown: the session is not running,
   /// the connection is disabled or in no input of the session, or the delegate died.
-  bool emit(const SampleBuffer& sample, const std::shared_ptr<CaptureConnection>& connection);
+  bool emitSample(const SampleBuffer& sample, const std::shared_ptr<CaptureConnection>& connection);
   /// The same with a new sample on the first enabled connection of that type.
   bool emitSample(MediaType type, std::optional<HostTime> hostTime);
 

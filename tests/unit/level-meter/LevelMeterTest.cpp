@@ -30,7 +30,7 @@ protected:
     for (const auto& connection : output_->connections()) {
       if (connection->mediaType() == type) {
         const lumora::fakes::FakeSampleBuffer sample(platform_.mediaCapture->hostTime(), levels);
-        EXPECT_TRUE(output_->emit(sample, connection));
+        EXPECT_TRUE(output_->emitSample(sample, connection));
         EXPECT_EQ(sample.reads() > 0, type == MediaType::Sound);
       }
     }

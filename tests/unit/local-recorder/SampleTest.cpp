@@ -88,10 +88,10 @@ TEST_F(Sample, pausesAlthoughTheStartIsNotDueYet_whenThePauseIs) {
 
 TEST_F(Sample, isNotRead_whenNothingIsPending) {
   const lumora::fakes::FakeSampleBuffer unread(5000);
-  ASSERT_TRUE(output().emit(unread, output().connections()[0]));
+  ASSERT_TRUE(output().emitSample(unread, output().connections()[0]));
   EXPECT_EQ(unread.reads(), 0);
   recorder_->start();
-  ASSERT_TRUE(output().emit(unread, output().connections()[0]));
+  ASSERT_TRUE(output().emitSample(unread, output().connections()[0]));
   EXPECT_EQ(unread.reads(), 1);
 }
 

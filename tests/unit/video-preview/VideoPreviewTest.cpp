@@ -33,7 +33,7 @@ protected:
     const lumora::fakes::FakeSampleBuffer sample(platform_.mediaCapture->hostTime(), picture);
     for (const auto& connection : output_->connections()) {
       if (connection->mediaType() == type) {
-        EXPECT_TRUE(output_->emit(sample, connection));
+        EXPECT_TRUE(output_->emitSample(sample, connection));
       }
     }
     return sample.reads();
