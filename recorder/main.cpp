@@ -29,9 +29,7 @@ int main(int argc, char** argv) {
         std::make_shared<lumora::RootedToolRunner>(parser.value("sandbox").toStdString(), platform.toolRunner);
     lumora::Platform::install(platform);
   }
-  // As the texts run: a language without texts here is shown in English.
-  const bool isRightToLeft = recorder::words("Record").isRightToLeft();
-  QApplication::setLayoutDirection(isRightToLeft ? Qt::RightToLeft : Qt::LeftToRight);
+  QApplication::setLayoutDirection(recorder::textDirection());
   recorder::RecorderWindow window;
   window.show();
   window.logIn();

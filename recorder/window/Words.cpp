@@ -11,6 +11,11 @@ constexpr int manyHours = 100;
 
 } // namespace
 
+Qt::LayoutDirection textDirection() {
+  // Of a text, not of the language: one without texts here is shown in English.
+  return words("Record").isRightToLeft() ? Qt::RightToLeft : Qt::LeftToRight;
+}
+
 QString clockText(double seconds) {
   const int whole = static_cast<int>(std::floor(seconds));
   const QString rest = QString("%1:%2")

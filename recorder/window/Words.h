@@ -11,6 +11,9 @@ inline QString words(Text english) {
   return QString::fromStdString(text(english));
 }
 
+/// In which the texts of the user's language run: from right to left in Arabic.
+Qt::LayoutDirection textDirection();
+
 /// "0:07", "1:02:03".
 QString clockText(double seconds);
 
