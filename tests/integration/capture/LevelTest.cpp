@@ -35,6 +35,9 @@ TEST_F(Level, isThatOfTheTone_whenAMicrophoneHearsOne) {
   const auto meter = LMRLevelMeter::meterWithCaptureSession_error(session_, &error);
   ASSERT_NE(meter, nullptr) << text(error);
   ASSERT_TRUE(hear(*meter));
+  // The tone may have begun in the midst of that block.
+  heard_.clear();
+  ASSERT_TRUE(hear(*meter));
   EXPECT_LE(heard_[0].peak, 1);
   EXPECT_NEAR(heard_[0].rms / heard_[0].peak, 0.707, 0.15);
   EXPECT_LT(meter->secondsOfSilence(), 10);
